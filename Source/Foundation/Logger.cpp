@@ -1,0 +1,124 @@
+#include "Foundation/Logger.h"
+
+#include "Foundation/Switches.h"
+#include "Foundation/TypeName.h"
+#include "Foundation/Utils.h"
+
+#include <unistd.h>
+
+#include <atomic>
+#include <cstdio>
+#include <cstring>
+#include <string>
+
+namespace Foundation {
+
+namespace {
+
+// Lines may come from the queue that deletes files, so what they count is atomic.
+std::atomic<int> sInsideLogCall = 0;
+std::atomic<unsigned> sExceptionHits = 0;
+std::atomic<LogSink*> sSink = nullptr;
+
+/// The preference "OVLog", read once for the process.
+bool isLoggingOn() {
+    static const bool sIsOn = GetBoolPref("OVLog", false);
+    return sIsOn;
+}
+
+bool isFacilityOn(const char* name) {
+    if (!isLoggingOn()) return false;
+    if (!name) return true;
+    char key[100];
+    std::snprintf(key, sizeof key, "OVLog%s", name);
+    return GetBoolPref(key, false);
+}
+
+bool decideOnSystemLog() {
+    char set[2];
+    if (Compatibility::Utils::copyenv(set, sizeof set, "OVUseSystemLog")) {
+        return GetBoolEnv("OVUseSystemLog");
+    }
+    return !isatty(STDERR_FILENO);
+}
+
+LogSink& currentSink() {
+    if (LogSink* sink = sSink) return *sink;
+    static const bool gUseSystemLog = decideOnSystemLog();
+    return gUseSystemLog ? journalSink() : standardErrorSink();
+}
+
+}  // namespace
+
+void Logger::_init() {
+    if (mState < 0) return;
+    mDisabled = mState < 2 && !isFacilityOn(mName);
+    mAlways = mState > 1;
+    mLineCount = 0;
+    mState = -1;
+}
+
+void Logger::setEnabled(bool enabled) {
+    _init();
+    mDisabled = !enabled;
+}
+
+bool Logger::willLog() {
+    _init();
+    if (mDisabled) return false;
+    if (mAlways) return true;
+    gLog._init();
+    return !gLog.mDisabled;
+}
+
+void Logger::alwaysLogV(const char* format, std::span<const OVFormatArgument> arguments) noexcept {
+    try {
+        _init();
+        const InsideLogCall inside;
+        ++mLineCount;
+        currentSink().write(*this, OVFormatV(format, arguments));
+    } catch (...) {
+        // A line that cannot be written is lost: its caller must not fail for it.
+        std::fputs("Orvane: a line of the log could not be written\n", stderr);
+    }
+}
+
+LogSink* setLogSink(LogSink* sink) {
+    return sSink.exchange(sink);
+}
+
+int insideLogCall() {
+    return sInsideLogCall;
+}
+
+InsideLogCall::InsideLogCall() {
+    ++sInsideLogCall;
+}
+InsideLogCall::~InsideLogCall() {
+    --sInsideLogCall;
+}
+
+void doWarnAboutException(const std::exception* e, const char* where) noexcept {
+    ++sExceptionHits;
+    if (e) {
+        gWarn.log("%s \"%s\" caught in %s", getTypeName(typeid(*e)), e->what(), where);
+    } else {
+        gWarn.log("Unknown exception caught in %s", where);
+    }
+}
+
+void warnAboutCurrentException(const char* where) noexcept {
+    try {
+        throw;
+    } catch (const std::exception& e) {
+        doWarnAboutException(&e, where);
+    } catch (...) {
+        doWarnAboutException(nullptr, where);
+    }
+}
+
+unsigned getExceptionHits() {
+    return sExceptionHits;
+}
+
+}  // namespace Foundation

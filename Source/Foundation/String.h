@@ -1,0 +1,46 @@
+#pragma once
+
+#include "Foundation/PFRefCounted.h"
+#include "Foundation/Returner.h"
+
+#include <Orvane/OVFormat.h>
+
+#include <string>
+#include <string_view>
+
+namespace Foundation {
+
+/// An immutable text. Kept, and given to the outside, as UTF-8.
+class String : public PFRefCounted {
+ public:
+    /// The text of a UTF-8 C string; null for null and, with a warning, for what is not UTF-8.
+    static StringReturner string(const char* utf8);
+    /// The text of UTF-8 that is known to be valid, such as what this process formatted.
+    static StringReturner string(std::string utf8);
+
+    template <class... Args>
+    static StringReturner stringWithFormat(OVFormatString<Args...> format,
+                                           const Args&... arguments) {
+        return string(OVFormat(format, arguments...));
+    }
+
+    std::size_t getHash() const override;
+    bool isEqual(const PFRefCounted* other) const override;
+    StringReturner toString() const override;
+
+    /// The text as UTF-8. Valid as long as the string.
+    std::string_view view() const { return mText; }
+    const std::string& utf8() const { return mText; }
+
+ protected:
+    explicit String(std::string utf8) : mText(std::move(utf8)) {}
+
+    std::string mText;
+};
+
+/// The text of an object's `toString`, which the current pool owns; null for null, and
+/// "BAD_OBJECT(%p)" for a pointer that cannot be one.
+String* ToString(const PFRefCounted* object);
+String* ToString(const RefCounted* object);
+
+}  // namespace Foundation

@@ -1,0 +1,69 @@
+#include "Foundation/Utils.h"
+
+#include "Foundation/Logger.h"
+#include "Foundation/Switches.h"
+
+#include <cxxabi.h>
+#include <execinfo.h>
+
+#include <algorithm>
+#include <cstdio>
+#include <cstdlib>
+#include <cstring>
+#include <memory>
+#include <string>
+#include <vector>
+
+namespace Compatibility {
+
+namespace {
+
+/// One frame as the stack service words it, "object(mangled+offset) [address]", made readable.
+std::string demangledFrame(const char* frame) {
+    const char* open = std::strchr(frame, '(');
+    const char* plus = open ? std::strchr(open, '+') : nullptr;
+    if (!plus) return frame;
+    const std::string mangled(open + 1, plus);
+    int status = 0;
+    const std::unique_ptr<char, void (*)(void*)> name(
+        abi::__cxa_demangle(mangled.c_str(), nullptr, nullptr, &status), std::free);
+    if (status != 0) return frame;
+    return std::string(frame, open + 1) + name.get() + plus;
+}
+
+}  // namespace
+
+bool Utils::copyenv(char* buffer, std::size_t size, const char* name) {
+    const char* value = std::getenv(name);
+    if (!value) return false;
+    std::snprintf(buffer, size, "%s", value);
+    return true;
+}
+
+int Utils::str2int(const char* text, bool hex) {
+    return static_cast<int>(std::strtol(text, nullptr, hex ? 16 : 10));
+}
+
+std::int64_t Utils::str2longlong(const char* text) {
+    return std::strtoll(text, nullptr, 10);
+}
+
+void Utils::printStack(int skip, int count) {
+    static const bool sIsOn = Foundation::GetBoolPref("OVPrintStack", false);
+    if (!sIsOn) return;
+    const int first = skip + 1;  // this function's own frame
+    std::vector<void*> addresses(static_cast<std::size_t>(first + count + 1));
+    const int found = backtrace(addresses.data(), static_cast<int>(addresses.size()));
+    const std::unique_ptr<char*, void (*)(void*)> frames(backtrace_symbols(addresses.data(), found),
+                                                         std::free);
+    if (!frames || found == 0) {
+        Foundation::gWarn.log("The call stack can't be read");
+        return;
+    }
+    for (int i = first; i < std::min(found, first + count); ++i) {
+        std::fprintf(stderr, "\t%s\n", demangledFrame(frames.get()[i]).c_str());
+    }
+    if (found > first + count) std::fputs("\t...more...\n", stderr);
+}
+
+}  // namespace Compatibility

@@ -1,0 +1,22 @@
+#include "Support/TempDir.h"
+
+#include <gtest/gtest.h>
+
+#include <cstdlib>
+
+/// Every test program runs in folders and with settings of its own, never the user's.
+int main(int argc, char** argv) {
+    testing::InitGoogleTest(&argc, argv);
+    const Support::TempDir home;
+    for (const char* name :
+         {"HOME", "XDG_DATA_HOME", "XDG_CONFIG_HOME", "XDG_CACHE_HOME", "XDG_RUNTIME_DIR"}) {
+        setenv(name, home.makeDirectory(name).c_str(), 1);
+    }
+    setenv("TZ", "UTC", 1);
+    setenv("OVUseSystemLog", "0", 1);
+    for (const char* name : {"DBUS_SESSION_BUS_ADDRESS", "LANGUAGE", "OVLog"}) {
+        unsetenv(name);
+    }
+    setenv("LC_ALL", "C", 1);
+    return RUN_ALL_TESTS();
+}
