@@ -117,19 +117,24 @@ concept OVFormatObject = requires(const T* object) {
     { describeForFormat(object) } -> std::same_as<std::string>;
 };
 
+/// The same, and refuses classes that are only declared: they would be taken for plain addresses.
+template <class T>
+constexpr bool OVIsFormatObject() {
+    if constexpr (std::is_class_v<std::remove_cv_t<T>>) {
+        static_assert(
+            requires { sizeof(T); }, "a class must be defined where it is formatted");
+        return OVFormatObject<T>;
+    }
+    return false;
+}
+
 template <class T>
 requires(!std::is_convertible_v<T*, const char*>) struct OVFormatTraits<T*> {
-    static consteval bool isObject() {
-        if constexpr (std::is_class_v<std::remove_cv_t<T>>) {
-            static_assert(sizeof(T) > 0, "a class must be defined where it is formatted");
-            return OVFormatObject<T>;
-        }
-        return false;
-    }
-    static constexpr OVFormatKind kind = isObject() ? OVFormatKind::Object : OVFormatKind::Pointer;
+    static constexpr OVFormatKind kind =
+        OVIsFormatObject<T>() ? OVFormatKind::Object : OVFormatKind::Pointer;
     static OVFormatArgument make(T* value) {
         const auto* pointer = reinterpret_cast<const void*>(value);
-        if constexpr (isObject()) {
+        if constexpr (kind == OVFormatKind::Object) {
             return {pointer, [](const void* object) {
                         return describeForFormat(static_cast<const T*>(object));
                     }};

@@ -20,7 +20,7 @@ class [[nodiscard]] Returner {
     Returner(std::nullptr_t) {}
     /// Takes over the caller's reference, as a new value has it. May be null.
     explicit Returner(T* owned) : mObject(owned) {}
-    /// Takes a further reference.
+    /// Takes a further reference. Like the next one defined in `Ref.h`, which has what it takes.
     Returner(const Ref<T>& object);
     /// Takes over what the reference holds.
     Returner(Ref<T>&& object);
@@ -54,5 +54,3 @@ using DataReturner = Returner<Data>;
 using URLReturner = Returner<URL>;
 
 }  // namespace Foundation
-
-#include "Foundation/Ref.h"

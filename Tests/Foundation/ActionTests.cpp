@@ -35,7 +35,8 @@ void addTo(Sender* sender, int amount) {
     sender->value += amount;
 }
 
-void noteCount(Sender* sender, Ref<PFRefCounted> context) {
+// By value, as a receiver passes it: each call holds a counted copy.
+void noteCount(Sender* sender, Ref<PFRefCounted> context) {  // NOLINT
     sender->value = static_cast<int>(context->getRetainCount());
 }
 

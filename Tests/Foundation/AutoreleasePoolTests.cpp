@@ -108,7 +108,7 @@ TEST(AutoreleasePool, NeverThrowsWhileUnwinding) {
         ~EndsOutOfOrder() { pool->~AutoreleasePool(); }
     };
     try {
-        const EndsOutOfOrder guard{below};
+        [[maybe_unused]] const EndsOutOfOrder guard{below};
         throw std::runtime_error("first");
     } catch (const std::runtime_error& e) {
         EXPECT_STREQ(e.what(), "first");

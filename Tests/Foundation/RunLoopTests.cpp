@@ -39,7 +39,7 @@ class RunLoopTest : public testing::Test {
         timers.push_back(timer);
         return timers.back();
     }
-    RunLoopTimer* at(double delay, std::string name,
+    RunLoopTimer* at(double delay, const std::string& name,
                      const std::string& mode = RunLoop::kCommonModes) {
         return arm(
             delay, 0, [this, name] { notes.push_back(name); }, mode);

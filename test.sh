@@ -1,0 +1,15 @@
+#!/bin/sh
+# Installs what the tests need, builds, and runs every test but those with the label "slow".
+set -eu
+cd "$(dirname "$0")"
+
+Tools/install_packages build run test
+
+cmake --preset debug
+cmake --build --preset debug
+
+cmake --preset fuzz
+cmake --build --preset fuzz --target fuzzers
+ctest --preset fuzz --parallel 2
+
+ctest --preset debug --parallel 2 "$@"
