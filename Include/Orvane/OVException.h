@@ -1,0 +1,17 @@
+#pragma once
+
+#include <Orvane/OVBase.h>
+
+#include <stdexcept>
+#include <string>
+
+/// What the library throws at an application: a call failed that gives no other sign of failure,
+/// or the application broke a rule of the interface. `what()` tells what happened, in English.
+class OV_EXPORT OVException : public std::runtime_error {
+ public:
+    explicit OVException(const std::string& text);
+    OVException(const OVException&) = default;
+    OVException& operator=(const OVException&) = default;
+    /// Defined in the library, so that the class has one identity in it and all applications.
+    ~OVException() override;
+};
