@@ -26,6 +26,7 @@ int main(int argc, char** argv) {
         unsetenv(name);
     }
     setenv("LC_ALL", "C", 1);
+    setenv("GSETTINGS_BACKEND", "memory", 1);
     const int result = RUN_ALL_TESTS();
     const bool skippedAny = testing::UnitTest::GetInstance()->skipped_test_count() > 0;
     return result == 0 && skippedAny ? kSkipped : result;
