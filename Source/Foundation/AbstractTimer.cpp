@@ -3,6 +3,7 @@
 #include "Foundation/AssertionFailure.h"
 #include "Foundation/AutoreleasePool.h"
 #include "Foundation/Clock.h"
+#include "Foundation/Date.h"
 #include "Foundation/Logger.h"
 #include "Foundation/RunLoop.h"
 
@@ -29,6 +30,14 @@ void AbstractTimer::start(double fireTime, double repeatInterval) {
 void AbstractTimer::start(double interval, bool repeats) {
     OV_ASSERT_AS(!repeats || interval > 0.0001, "!repeats || interval>0.0001");
     start(Clock::current().now() + interval, repeats ? interval : 0.0);
+}
+
+void AbstractTimer::start(const Date* date) {
+    if (date) {
+        start(date->getAbsoluteTime(), 0.0);
+    } else {
+        stop();
+    }
 }
 
 void AbstractTimer::stop() {

@@ -6,6 +6,8 @@
 
 namespace Foundation {
 
+class Date;
+
 /// A run-loop timer that calls its own `fire`. It can be armed again and again, also from inside
 /// `fire`, and disarms itself when it is destroyed, which `fire` may do too.
 ///
@@ -28,6 +30,8 @@ class AbstractTimer : Uncopyable {
     /// after. 0 fires in the loop's next turn. A repeating timer needs more than 0.0001 seconds
     /// and throws `AssertionFailure` for less.
     void start(double interval, bool repeats);
+    /// Arms the timer as a one-shot for `date`; null stops it.
+    void start(const Date* date);
     /// Disarms the timer, if it is armed.
     void stop();
 

@@ -2,6 +2,7 @@
 
 #include "Foundation/AssertionFailure.h"
 #include "Foundation/AutoreleasePool.h"
+#include "Foundation/Date.h"
 #include "Foundation/RunLoop.h"
 #include "Support/LogCapture.h"
 #include "Support/ManualClock.h"
@@ -119,6 +120,22 @@ TEST_F(AbstractTimerTest, ATimeThatIsNoNumberCannotBeArmed) {
     EXPECT_EQ(failureOfStart(std::nan(""), false), "mTimer");
     EXPECT_THROW(timer.start(1.0, std::nan("")), AssertionFailure);
     EXPECT_EQ(timer.getTimeRemaining(), kInfinity);
+}
+
+TEST_F(AbstractTimerTest, FiresOnceAtADate) {
+    AutoreleasePool pool;
+    timer.start(Date::nowPlus(4));
+    EXPECT_EQ(timer.getTimeRemaining(), 4);
+    clock.advanceBy(20);
+    EXPECT_EQ(timer.fired, Times({4}));
+}
+
+TEST_F(AbstractTimerTest, ANullDateStopsAnArmedTimer) {
+    timer.start(1.0, true);
+    timer.start(nullptr);
+    EXPECT_EQ(timer.getTimeRemaining(), kInfinity);
+    clock.advanceBy(5);
+    EXPECT_EQ(timer.fired, Times());
 }
 
 TEST_F(AbstractTimerTest, StartingAgainReplacesTheFirstStart) {
