@@ -10,7 +10,7 @@ namespace {
 constexpr int kAny = INT_MIN;
 
 struct Row {
-    std::int64_t sourceDomain;
+    int sourceDomain;
     int sourceCode;
     const char* domain;
     int code;
