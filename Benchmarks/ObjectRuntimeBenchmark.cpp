@@ -3,10 +3,9 @@
 #include "Benchmarks/Measure.h"
 #include "Foundation/AutoreleasePool.h"
 #include "Foundation/Ref.h"
+#include "Support/AllocationCounter.h"
 
-#include <cstdlib>
 #include <memory>
-#include <new>
 
 using namespace Foundation;
 using Benchmarks::compare;
@@ -14,8 +13,6 @@ using Benchmarks::keep;
 using Benchmarks::report;
 
 namespace {
-
-std::size_t sAllocations = 0;
 
 constexpr int kCount = 200'000;
 constexpr int kEntries = 256;
@@ -93,7 +90,7 @@ std::size_t allocationsOfAPool() {
     for (int i = 0; i < kEntries; ++i) {
         objects.emplace_back(new Object);
     }
-    const std::size_t before = sAllocations;
+    const std::size_t before = Support::allocations();
     {
         AutoreleasePool pool;
         for (const Ref<Object>& entry : objects) {
@@ -101,22 +98,10 @@ std::size_t allocationsOfAPool() {
             entry->autorelease();
         }
     }
-    return sAllocations - before;
+    return Support::allocations() - before;
 }
 
 }  // namespace
-
-void* operator new(std::size_t size) {
-    ++sAllocations;
-    if (void* memory = std::malloc(size)) return memory;
-    throw std::bad_alloc();
-}
-void operator delete(void* memory) noexcept {
-    std::free(memory);
-}
-void operator delete(void* memory, std::size_t) noexcept {
-    std::free(memory);
-}
 
 int main() {
     makingAnObject();

@@ -7,7 +7,6 @@
 
 #include <gtest/gtest.h>
 
-#include <cstdlib>
 #include <memory>
 #include <new>
 #include <thread>
@@ -74,9 +73,6 @@ TEST(AutoreleasePool, NestsAndDrainsInnermostFirst) {
 
 namespace {
 
-/// How often `operator new` was asked.
-std::size_t sAllocations = 0;
-
 /// Holds pools outside their scopes, which only a test may do.
 struct PoolSlot {
     alignas(AutoreleasePool) std::byte space[sizeof(AutoreleasePool)];
@@ -84,39 +80,6 @@ struct PoolSlot {
 };
 
 }  // namespace
-
-void* operator new(std::size_t size) {
-    ++sAllocations;
-    if (void* memory = std::malloc(size)) return memory;
-    throw std::bad_alloc();
-}
-void operator delete(void* memory) noexcept {
-    std::free(memory);
-}
-void operator delete(void* memory, std::size_t) noexcept {
-    std::free(memory);
-}
-
-TEST(AutoreleasePool, AllocatesNothingFor256Entries) {
-    Deaths deaths;
-    std::vector<Ref<TrackedObject>> objects;
-    for (int i = 0; i < 257; ++i) {
-        objects.emplace_back(new TrackedObject("a", &deaths));
-    }
-    const auto allocationsFor = [&](int entries) {
-        const std::size_t before = sAllocations;
-        {
-            AutoreleasePool pool;
-            for (int i = 0; i < entries; ++i) {
-                objects[i]->retain();
-                objects[i]->autorelease();
-            }
-        }
-        return sAllocations - before;
-    };
-    EXPECT_EQ(allocationsFor(256), 0u);
-    EXPECT_EQ(allocationsFor(257), 1u);
-}
 
 TEST(AutoreleasePool, PoppedOutOfOrderItIsAnAssertionThatNamesBothPools) {
     LogCapture log;
