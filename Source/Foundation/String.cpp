@@ -34,8 +34,23 @@ StringReturner String::string(std::string utf8) {
     return StringReturner(new String(std::move(utf8)));
 }
 
+StringReturner String::hexString(Bytes bytes) {
+    constexpr std::string_view kDigits = "0123456789abcdef";
+    std::string text;
+    text.reserve(2 * bytes.getLength());
+    for (const unsigned char byte : bytes.view()) {
+        text += kDigits[byte >> 4];
+        text += kDigits[byte & 15];
+    }
+    return string(std::move(text));
+}
+
+std::size_t String::hashOf(std::string_view utf8) {
+    return std::hash<std::string_view>()(utf8);
+}
+
 std::size_t String::getHash() const {
-    return std::hash<std::string_view>()(mText);
+    return hashOf(mText);
 }
 
 bool String::isEqual(const PFRefCounted* other) const {

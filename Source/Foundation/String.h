@@ -1,5 +1,6 @@
 #pragma once
 
+#include "Foundation/Bytes.h"
 #include "Foundation/PFRefCounted.h"
 #include "Foundation/Returner.h"
 
@@ -24,7 +25,12 @@ class String : public PFRefCounted {
         return string(OVFormat(format, arguments...));
     }
 
+    /// Two lower-case hexadecimal digits for each byte.
+    static StringReturner hexString(Bytes bytes);
+
     std::size_t getHash() const override;
+    /// The hash of a string of this text.
+    static std::size_t hashOf(std::string_view utf8);
     bool isEqual(const PFRefCounted* other) const override;
     StringReturner toString() const override;
 
