@@ -81,6 +81,7 @@ void RunLoop::Mode::attach(RunLoopSource* source) {
     entry->source = source;
     entry->interest = {};
     entry->fdTag = nullptr;
+    g_source_set_can_recurse(gSource, source->isReentrant());
     g_source_set_name(gSource, "Orvane source");
     g_source_attach(gSource, mContext);
     mSources[source] = gSource;

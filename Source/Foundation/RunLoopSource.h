@@ -41,6 +41,9 @@ class RunLoopSource : Uncopyable {
     /// tells what the descriptor is ready for, 0 after `readyNow` or a deadline. May remove or
     /// destroy the source.
     virtual void ready(short events) = 0;
+    /// Whether a run of the loop inside `ready` may call `ready` again. Asked when the source joins
+    /// a mode.
+    virtual bool isReentrant() const noexcept { return false; }
 
     RunLoop* mLoop = nullptr;
     std::string mMode;
