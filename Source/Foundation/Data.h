@@ -12,6 +12,7 @@ namespace Foundation {
 
 class Data;
 class MutableData;
+struct NetError;
 
 /// A block of bytes. Immutable for who holds it as this.
 class Data : public PFRefCounted {
@@ -27,6 +28,16 @@ class Data : public PFRefCounted {
     static Returner<MutableData> mutableData(std::size_t size = 0);
     /// A copy of the bytes.
     static Returner<MutableData> mutableData(Bytes bytes);
+
+    /// The content of the file that a URL names. Null, with the error, where it cannot be read: see
+    /// `fileError`; a URL of something else than a local file is code -11 of domain 15. Throws
+    /// `AssertionFailure` for null.
+    static DataReturner dataFromResource(URL* url, NetError& error);
+    static DataReturner dataFromResource(URL* url);
+    /// Makes these bytes the whole content of the file that a URL names, in one step; see
+    /// `AtomicFile`. False, with the error as above, if that fails.
+    [[nodiscard]] bool writeToResource(URL* url, NetError& error) const;
+    [[nodiscard]] bool writeToResource(URL* url) const;
 
     /// Valid as long as the data and, of a `MutableData`, until it changes. Of null, no bytes.
     static Bytes asBytes(const Data* data) { return data ? data->asBytes() : Bytes(); }

@@ -19,6 +19,10 @@ class String : public PFRefCounted {
     /// The text of UTF-8 that is known to be valid, such as what this process formatted.
     static StringReturner string(std::string utf8);
 
+    /// The text of the file that a URL names, in UTF-8. Throws `AssertionFailure` where it cannot
+    /// be read or is not UTF-8, and for null.
+    static StringReturner stringFromResource(URL* url);
+
     template <class... Args>
     static StringReturner stringWithFormat(OVFormatString<Args...> format,
                                            const Args&... arguments) {

@@ -1,6 +1,7 @@
 #include "Foundation/URL.h"
 
 #include "Foundation/AssertionFailure.h"
+#include "Foundation/Data.h"
 #include "Foundation/Logger.h"
 #include "Foundation/URLCharacters.h"
 #include "Foundation/URLRanges.h"
@@ -116,6 +117,10 @@ StringReturner URL::getString() const {
 StringReturner URL::getString(String* stillEscaped) const {
     if (!stillEscaped) return getString();
     return unescapedTextOf(mText, stillEscaped->view());
+}
+
+DataReturner URL::getData() const {
+    return Data::adopt(mText);
 }
 
 StringReturner URL::getAbsoluteString() const {

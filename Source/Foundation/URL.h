@@ -39,6 +39,8 @@ class URL : public PFRefCounted {
     /// in `stillEscaped`. Null undoes none, the empty string all. Null if what comes out is no
     /// UTF-8.
     StringReturner getString(String* stillEscaped) const;
+    /// The bytes of the text.
+    DataReturner getData() const;
     /// The text of the absolute form.
     StringReturner getAbsoluteString() const;
     /// The same, with all escapes kept. Valid as long as the URL.

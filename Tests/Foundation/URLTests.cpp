@@ -2,6 +2,7 @@
 
 #include "Foundation/AssertionFailure.h"
 #include "Foundation/AutoreleasePool.h"
+#include "Foundation/Data.h"
 #include "Support/LogCapture.h"
 #include "Support/TempDir.h"
 
@@ -210,6 +211,7 @@ TEST(URL, UndoesEscapesInItsText) {
     const Ref<String> none = String::string("");
     const Ref<String> some = String::string("/%");
     const Ref<URL> url = strict("a/%C3%A4%2F%25%20");
+    EXPECT_EQ(Ref<Data>(url->getData())->view(), "a/%C3%A4%2F%25%20");
     EXPECT_EQ(text(url->getString(nullptr)), "a/%C3%A4%2F%25%20");
     EXPECT_EQ(text(url->getString(none)), "a/\xc3\xa4/% ");
     EXPECT_EQ(text(url->getString(some)), "a/\xc3\xa4%2F%25 ");
