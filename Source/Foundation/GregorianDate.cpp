@@ -1,5 +1,8 @@
 #include "Foundation/GregorianDate.h"
 
+#include "Foundation/Date.h"
+#include "Foundation/TimeZone.h"
+
 #include <algorithm>
 #include <cmath>
 
@@ -57,6 +60,30 @@ void setDay(GregorianDate& date, std::int64_t days) {
 }
 
 }  // namespace
+
+GregorianDate::GregorianDate(const Date* date) : GregorianDate(Date::getAbsoluteTime(date)) {}
+
+void GregorianDate::setAbsoluteTime(double absoluteTime) {
+    *this = inZone(absoluteTime, nullptr);
+}
+
+double GregorianDate::getAbsoluteTime() const {
+    return getAbsoluteTimeInZone(nullptr);
+}
+
+DateReturner GregorianDate::getDate() const {
+    return Date::date(getAbsoluteTime());
+}
+
+GregorianDate GregorianDate::inZone(double absoluteTime, const TimeZone* zone) {
+    if (!zone) zone = TimeZone::defaultZone();
+    return inGMT(absoluteTime + zone->getSecondsFromGMT(absoluteTime));
+}
+
+double GregorianDate::getAbsoluteTimeInZone(const TimeZone* zone) const {
+    if (!zone) zone = TimeZone::defaultZone();
+    return zone->getAbsoluteTime(getAbsoluteTimeInGMT());
+}
 
 GregorianDate GregorianDate::inGMT(double absoluteTime) {
     if (std::isnan(absoluteTime)) absoluteTime = 0;
