@@ -8,17 +8,17 @@
 namespace Foundation {
 
 void AssertionFailure::failed(const char* function, const char* condition) {
-    failedV(function, condition, nullptr, {});
+    failedV(function, condition, "", {});
 }
 
 void AssertionFailure::failedV(const char* function, const char* condition, const char* format,
                                std::span<const OVFormatArgument> arguments) {
-    const bool hasMessage = format && *format;
-    const std::string text = hasMessage ? OVFormatV(format, arguments) : condition;
+    const std::string text = *format ? OVFormatV(format, arguments) : condition;
     {
         const InsideLogCall inside;
         gWarn.log("ASSERTION FAILED: in %s: %s", function, text);
-        if (gWarn.willLog()) Compatibility::Utils::printStack(2, 10);
+        // Behind the two frames of this class comes the function in which the condition failed.
+        if (gWarn.willLog() && gLog.willLog()) Compatibility::Utils::printStack(2, 10);
     }
     throw AssertionFailure(text);
 }

@@ -25,24 +25,28 @@ class AssertionFailure : public std::runtime_error {
  public:
     using std::runtime_error::runtime_error;
 
-    /// Logs the failure with the call stack and throws. `function` is the caller's full signature,
-    /// `condition` the text of what did not hold.
-    [[noreturn]] static void failed(const char* function, const char* condition);
+    // Each of these is one frame of the stack, always: the stack is printed from their caller on.
+
+    /// Logs the failure, with the call stack where the log is on, and throws. `function` is the
+    /// caller's full signature, `condition` the text of what did not hold.
+    [[noreturn, gnu::noinline]] static void failed(const char* function, const char* condition);
+    /// The same with a message; an empty one stands for the condition.
     template <class... Args>
-    [[noreturn]] static void failed(const char* function, const char* condition,
-                                    OVFormatString<Args...> format, const Args&... arguments) {
-        OVWithFormatArguments(
-            [&](std::span<const OVFormatArgument> list) {
-                failedV(function, condition, format.text(), list);
-            },
-            arguments...);
-        __builtin_unreachable();
+    [[noreturn, gnu::noinline]] static void failed(const char* function, const char* condition,
+                                                   OVFormatString<Args...> format,
+                                                   const Args&... arguments) {
+        if constexpr (sizeof...(Args) == 0) {
+            failedV(function, condition, format.text(), {});
+        } else {
+            const OVFormatArgument list[] = {OVFormatTraits<Args>::make(arguments)...};
+            failedV(function, condition, format.text(), list);
+        }
     }
 
-    /// The same for a format known at run time; null or empty stands for the condition.
-    [[noreturn]] static void failedV(const char* function, const char* condition,
-                                     const char* format,
-                                     std::span<const OVFormatArgument> arguments);
+ private:
+    [[noreturn, gnu::noinline]] static void failedV(const char* function, const char* condition,
+                                                    const char* format,
+                                                    std::span<const OVFormatArgument> arguments);
 };
 
 }  // namespace Foundation

@@ -2,6 +2,7 @@
 
 #include "Foundation/Switches.h"
 #include "Foundation/TypeName.h"
+#include "Foundation/Uncopyable.h"
 #include "Foundation/Utils.h"
 
 #include <unistd.h>
@@ -20,6 +21,16 @@ std::atomic<int> sInsideLogCall = 0;
 std::atomic<unsigned> sExceptionHits = 0;
 std::atomic<LogSink*> sSink = nullptr;
 
+// Reading a preference may itself log, on a facility that is not settled yet. Until the reader is
+// done such a facility is off, and stays unsettled.
+thread_local bool sIsAskingPreferences = false;
+
+class AskingPreferences : Uncopyable {
+ public:
+    AskingPreferences() { sIsAskingPreferences = true; }
+    ~AskingPreferences() { sIsAskingPreferences = false; }
+};
+
 /// The preference "OVLog", read once for the process.
 bool isLoggingOn() {
     static const bool sIsOn = GetBoolPref("OVLog", false);
@@ -27,6 +38,7 @@ bool isLoggingOn() {
 }
 
 bool isFacilityOn(const char* name) {
+    const AskingPreferences asking;
     if (!isLoggingOn()) return false;
     if (!name) return true;
     char key[100];
@@ -52,6 +64,7 @@ LogSink& currentSink() {
 
 void Logger::_init() {
     if (mState < 0) return;
+    if (mState < 2 && sIsAskingPreferences) return;
     mDisabled = mState < 2 && !isFacilityOn(mName);
     mAlways = mState > 1;
     mLineCount = 0;
@@ -65,7 +78,7 @@ void Logger::setEnabled(bool enabled) {
 
 bool Logger::willLog() {
     _init();
-    if (mDisabled) return false;
+    if (mDisabled || mState >= 0) return false;
     if (mAlways) return true;
     gLog._init();
     return !gLog.mDisabled;

@@ -7,6 +7,7 @@
 #include <execinfo.h>
 
 #include <algorithm>
+#include <climits>
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
@@ -24,6 +25,8 @@ std::string demangledFrame(const char* frame) {
     const char* plus = open ? std::strchr(open, '+') : nullptr;
     if (!plus) return frame;
     const std::string mangled(open + 1, plus);
+    // The demangler takes the name of a C function for that of a type: "f" would become "float".
+    if (!mangled.starts_with("_Z")) return frame;
     int status = 0;
     const std::unique_ptr<char, void (*)(void*)> name(
         abi::__cxa_demangle(mangled.c_str(), nullptr, nullptr, &status), std::free);
@@ -41,19 +44,24 @@ bool Utils::copyenv(char* buffer, std::size_t size, const char* name) {
 }
 
 int Utils::str2int(const char* text, bool hex) {
-    return static_cast<int>(std::strtol(text, nullptr, hex ? 16 : 10));
+    const long number = text ? std::strtol(text, nullptr, hex ? 16 : 10) : 0;
+    return static_cast<int>(std::clamp<long>(number, INT_MIN, INT_MAX));
 }
 
 std::int64_t Utils::str2longlong(const char* text) {
-    return std::strtoll(text, nullptr, 10);
+    return text ? std::strtoll(text, nullptr, 10) : 0;
 }
 
 void Utils::printStack(int skip, int count) {
-    static const bool sIsOn = Foundation::GetBoolPref("OVPrintStack", false);
-    if (!sIsOn) return;
+    if (!Foundation::GetBoolPref("OVPrintStack", false)) return;
     const int first = skip + 1;  // this function's own frame
     std::vector<void*> addresses(static_cast<std::size_t>(first + count + 1));
     const int found = backtrace(addresses.data(), static_cast<int>(addresses.size()));
+    addresses.resize(static_cast<std::size_t>(found));
+    for (void*& address : addresses) {
+        // The call itself: behind one that does not return, the next function may begin.
+        address = static_cast<char*>(address) - 1;
+    }
     const std::unique_ptr<char*, void (*)(void*)> frames(backtrace_symbols(addresses.data(), found),
                                                          std::free);
     if (!frames || found == 0) {
