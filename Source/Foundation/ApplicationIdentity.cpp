@@ -9,6 +9,7 @@
 #include <cerrno>
 #include <cstdlib>
 #include <filesystem>
+#include <mutex>
 
 namespace Foundation {
 
@@ -57,30 +58,44 @@ std::string determine() {
     return "unknown";
 }
 
-/// Empty as long as nothing has asked. Never destroyed: statics may ask at the process's end.
-std::string& identifier() {
-    static auto* const sIdentifier = new std::string;
-    return *sIdentifier;
+/// Empty as long as nothing has asked.
+struct Known {
+    std::mutex mutex;
+    std::string identifier;
+};
+
+/// Never destroyed: statics may ask at the process's end.
+Known& known() {
+    static auto* const sKnown = new Known;
+    return *sKnown;
 }
 
 }  // namespace
 
-const std::string& ApplicationIdentity::getIdentifier() {
-    if (identifier().empty()) identifier() = determine();
-    return identifier();
+std::string ApplicationIdentity::getIdentifier() {
+    Known& state = known();
+    const std::lock_guard lock(state.mutex);
+    if (state.identifier.empty()) state.identifier = determine();
+    return state.identifier;
 }
 
 void ApplicationIdentity::setIdentifier(const std::string& wanted) {
     OV_ASSERT_MESSAGE(!wanted.empty() && isValidUTF8(wanted),
                       "an application's identifier must be a text");
-    OV_ASSERT_MESSAGE(identifier().empty() || identifier() == wanted,
-                      "the application is known as %s already and can't become %s", identifier(),
-                      wanted);
-    identifier() = wanted;
+    Known& state = known();
+    std::unique_lock lock(state.mutex);
+    if (state.identifier.empty()) state.identifier = wanted;
+    const std::string held = state.identifier;
+    // What reports a failed assertion may ask who we are.
+    lock.unlock();
+    OV_ASSERT_MESSAGE(held == wanted, "the application is known as %s already and can't become %s",
+                      held, wanted);
 }
 
 void ApplicationIdentity::_forget() {
-    identifier().clear();
+    Known& state = known();
+    const std::lock_guard lock(state.mutex);
+    state.identifier.clear();
 }
 
 }  // namespace Foundation

@@ -13,10 +13,10 @@ namespace Foundation {
 ///  3. the desktop file that launched this process, without ".desktop";
 ///  4. the name of the program.
 ///
-/// Main thread.
+/// Any thread.
 struct ApplicationIdentity {
     /// Never empty, and valid UTF-8.
-    static const std::string& getIdentifier();
+    static std::string getIdentifier();
     /// For programs that know better, before anything asks. Throws `AssertionFailure` if another
     /// identifier is in use already, or for one that is empty or not UTF-8.
     static void setIdentifier(const std::string& identifier);

@@ -1,9 +1,9 @@
 #include "Foundation/RunningProcesses.h"
 
 #include "Foundation/DesktopLaunch.h"
+#include "Foundation/RunningApplications.h"
 
 #include <dirent.h>
-#include <glib.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
@@ -14,6 +14,7 @@
 #include <iterator>
 #include <memory>
 #include <string_view>
+#include <utility>
 
 namespace Foundation {
 
@@ -71,9 +72,7 @@ bool isOfThisUser(const std::string& process) {
 }
 
 void insertLowerCased(std::set<std::string>& names, std::string name) {
-    if (name.empty()) return;
-    std::transform(name.begin(), name.end(), name.begin(), g_ascii_tolower);
-    names.insert(std::move(name));
+    if (!name.empty()) names.insert(RunningApplications::lowerCased(std::move(name)));
 }
 
 void addProcess(std::set<std::string>& names, const std::string& process, int pid) {
