@@ -1,7 +1,7 @@
 #pragma once
 
 #include "Foundation/Array.h"
-#include "Foundation/Returner.h"
+#include "Foundation/Ref.h"
 
 #include <algorithm>
 #include <concepts>

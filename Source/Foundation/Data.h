@@ -39,6 +39,18 @@ class Data : public PFRefCounted {
     [[nodiscard]] bool writeToResource(URL* url, NetError& error) const;
     [[nodiscard]] bool writeToResource(URL* url) const;
 
+    /// The bytes of pairs of hexadecimal digits, of either case; an odd last character is ignored.
+    /// Null for null, and if another character stands among the pairs.
+    static DataReturner dataFromHex(const String* hex);
+    /// The bytes of a base64 text, see `Base64::decode`. Throws `AssertionFailure` for null.
+    static DataReturner dataFromBase64(const String* base64);
+
+    /// With "=" for padding, and no line breaks.
+    StringReturner base64String() const;
+    /// The SHA-1 of the bytes in 40 lower-case hexadecimal digits: the form of every identifier
+    /// and content hash.
+    StringReturner SHA1HashString() const;
+
     /// Valid as long as the data and, of a `MutableData`, until it changes. Of null, no bytes.
     static Bytes asBytes(const Data* data) { return data ? data->asBytes() : Bytes(); }
     Bytes asBytes() const { return Bytes(view()); }

@@ -1,7 +1,7 @@
 #pragma once
 
 #include "Foundation/Dictionary.h"
-#include "Foundation/Returner.h"
+#include "Foundation/Ref.h"
 #include "Foundation/String.h"
 
 #include <concepts>

@@ -95,3 +95,47 @@ TEST(MutableData, CutsAndFillsUp) {
     static_cast<char*>(data->getMutableBytes())[1] = 'x';
     EXPECT_EQ(data->view(), std::string_view("ax\0", 3));
 }
+
+TEST(Data, ReadsHexadecimalPairs) {
+    const auto bytesOf = [](const char* text) {
+        const Ref<String> hex = String::string(text);
+        const Ref<Data> data = Data::dataFromHex(hex);
+        return data ? std::string(data->view()) : std::string("(null)");
+    };
+    EXPECT_EQ(bytesOf("4142ff"), "AB\xFF");
+    EXPECT_EQ(bytesOf("4a4B"), "JK");
+    EXPECT_EQ(bytesOf("41424"), "AB");
+    EXPECT_EQ(bytesOf("4142x"), "AB");
+    EXPECT_EQ(bytesOf(""), "");
+    EXPECT_EQ(bytesOf("41x2"), "(null)");
+    EXPECT_EQ(Ref<Data>(Data::dataFromHex(nullptr)).get(), nullptr);
+}
+
+TEST(Data, GoesToBase64AndBack) {
+    const Ref<Data> data = Data::data("\0\xFF!", 3);
+    const Ref<String> text = data->base64String();
+    EXPECT_EQ(text->view(), "AP8h");
+    EXPECT_TRUE(data->isEqual(Ref<Data>(Data::dataFromBase64(text)).get()));
+}
+
+TEST(Data, RefusesNullAsBase64) {
+    const Support::LogCapture log;
+    try {
+        const Ref<Data> data = Data::dataFromBase64(nullptr);
+        FAIL();
+    } catch (const AssertionFailure& failure) {
+        EXPECT_STREQ(failure.what(), "base64");
+    }
+}
+
+TEST(Data, HashesAsPublished) {
+    const auto hashOf = [](std::string bytes) {
+        return Ref<String>(Ref<Data>(Data::adopt(std::move(bytes)))->SHA1HashString())->utf8();
+    };
+    EXPECT_EQ(hashOf(""), "da39a3ee5e6b4b0d3255bfef95601890afd80709");
+    EXPECT_EQ(hashOf("abc"), "a9993e364706816aba3e25717850c26c9cd0d89d");
+    EXPECT_EQ(hashOf(std::string(1000000, 'a')), "34aa973cd4c4daa4f61eeb2bdbad27316534016f");
+    const Ref<Data> none = Data::data(nullptr, 0, false);
+    EXPECT_EQ(Ref<String>(none->SHA1HashString())->view(),
+              "da39a3ee5e6b4b0d3255bfef95601890afd80709");
+}
