@@ -133,7 +133,7 @@ void Bus::dispatchSignal(BusMessage& signal) {
         if (!isFromItsSender(subscription->match, signal)) continue;
         signal.rewind();
         callGuarded("void Foundation::Bus::dispatchSignal(BusMessage &)",
-                    [&] { subscription->signalHandler(signal); });
+                    [&, subscription = subscription] { subscription->signalHandler(signal); });
     }
 }
 
@@ -166,7 +166,9 @@ void Bus::tellWatchers(const std::string& name, const std::string& oldOwner,
         if (subscription->isOver || !subscription->nameHandler) continue;
         if (!subscription->watchedName.empty() && subscription->watchedName != name) continue;
         callGuarded("void Foundation::Bus::tellWatchers(const std::string &)",
-                    [&] { subscription->nameHandler(name, oldOwner, newOwner); });
+                    [&, subscription = subscription] {
+                        subscription->nameHandler(name, oldOwner, newOwner);
+                    });
     }
 }
 
