@@ -1,6 +1,7 @@
 #include "Foundation/URLCharacters.h"
 
 #include <algorithm>
+#include <utility>
 
 namespace Foundation {
 
