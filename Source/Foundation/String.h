@@ -67,6 +67,10 @@ class String : public PFRefCounted {
     static StringReturner stringWithFormatAndArgs(const String* format,
                                                   std::span<const OVFormatArgument> arguments);
 
+    /// The size of that many bytes, for people: "1 byte", "3.4 KB". A unit is 1024 of the one
+    /// below; of negative sizes the sign is left out.
+    static StringReturner representationForBytes(long long count);
+
     /// A copy that can be changed.
     Returner<MutableString> mutableCopy() const;
     /// As `string`.
