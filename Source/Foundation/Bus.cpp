@@ -52,6 +52,10 @@ void Bus::onItsThread(std::function<void()> function) {
     }
 }
 
+void Bus::onLaterTurn(std::function<void()> function) {
+    getLoop()->perform(std::move(function));
+}
+
 bool Bus::connect() {
     if (isConnected()) return true;
     // A broken connection is for the loop to find, after what it had still brought.
@@ -128,8 +132,9 @@ void Bus::close() {
     if (isConnected()) flush(kBusTimeoutSeconds);
     mConnection.reset();
     mIncoming.clear();
-    if (mRetryTimer) mRetryTimer->invalidate();
-    mRetryTimer = nullptr;
+    // Moved out, since what an assignment replaces would go to a pool, and there may be none.
+    const Ref<RunLoopTimer> timer = std::move(mRetryTimer);
+    if (timer) timer->invalidate();
     mRetrySeconds = kFirstRetrySeconds;
     mHasComplained = false;
     for (auto& [name, watched] : mWatched) {

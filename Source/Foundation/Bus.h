@@ -33,8 +33,8 @@ class BusSubscription : Uncopyable {
 using BusSubscriptionPtr = std::unique_ptr<BusSubscription>;
 
 /// The process's connection to a message bus, on the run loop of the thread that first used it, in
-/// the common modes. It connects on first use. Every operation but `onItsThread` belongs to that
-/// thread.
+/// the common modes. It connects on first use. Every operation but these two, `onItsThread` and
+/// `onLaterTurn`, belongs to that thread.
 ///
 /// What arrives is delivered in turns of the loop, in the order in which the bus sent it, never
 /// from inside another operation; a run of the loop inside a delivery goes on with the next
@@ -63,6 +63,8 @@ class Bus : RunLoopSource {
 
     /// Calls `function` on the bus's thread: at once there, in a turn of its loop elsewhere.
     void onItsThread(std::function<void()> function);
+    /// Calls `function` in a later turn of the bus's loop. Any thread.
+    void onLaterTurn(std::function<void()> function);
 
     /// Whether there is a connection. Makes one if none was tried for yet, or it was closed.
     bool connect();

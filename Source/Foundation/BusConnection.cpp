@@ -121,10 +121,10 @@ bool BusConnection::send(BusMessage& message, Messages& into) {
 bool BusConnection::flush(double seconds, Messages& into) {
     const double deadline = monotonicSeconds() + seconds;
     while (isOpen()) {
-        pump(kMessagesPerRound, into);
         std::uint64_t queued = 0;
         sd_bus_get_n_queued_write(mBus, &queued);
         if (queued == 0) return true;
+        pump(kMessagesPerRound, into);
         const double left = deadline - monotonicSeconds();
         if (left <= 0) return false;
         // Reading too, for a bus may wait for us to read before it reads on.

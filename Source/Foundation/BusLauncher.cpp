@@ -2,6 +2,7 @@
 
 #include "Foundation/RuntimeDirectory.h"
 #include "Foundation/Uncopyable.h"
+#include "Foundation/UniqueFD.h"
 
 #include <fcntl.h>
 #include <glib.h>
@@ -24,21 +25,6 @@ extern char** environ;
 namespace Foundation {
 
 namespace {
-
-/// Owns a descriptor.
-class Descriptor : Uncopyable {
- public:
-    explicit Descriptor(int fd) : mFD(fd) {}
-    ~Descriptor() { reset(); }
-
-    int get() const { return mFD; }
-    void reset() {
-        if (mFD >= 0) close(std::exchange(mFD, -1));
-    }
-
- private:
-    int mFD;
-};
 
 /// Waits for the lock of `path`, which its end gives up. Whoever holds it is done within
 /// `BusLauncher::kStartSeconds`. -1 if the file cannot be had.
@@ -64,7 +50,7 @@ Answer askWhoListens(const std::string& path) {
     address.sun_family = AF_UNIX;
     if (path.size() >= sizeof address.sun_path) return Answer::PathTooLong;
     path.copy(address.sun_path, path.size());
-    const Descriptor fd(socket(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC | SOCK_NONBLOCK, 0));
+    const UniqueFD fd(socket(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC | SOCK_NONBLOCK, 0));
     const int result =
         connect(fd.get(), reinterpret_cast<const sockaddr*>(&address), sizeof address);
     // A full queue of waiting connections means that somebody listens.
@@ -126,8 +112,8 @@ bool startDaemon(const std::string& address, std::string& error) {
         error = std::string("can't make a pipe: ") + std::strerror(errno);
         return false;
     }
-    const Descriptor word(fds[0]);
-    Descriptor ready(fds[1]);
+    const UniqueFD word(fds[0]);
+    UniqueFD ready(fds[1]);
     const Beginning beginning(ready.get());
     const std::string listen = "--address=" + address;
     // It forks once it listens, so that it is nobody's child and leaves no zombie behind.
@@ -137,7 +123,7 @@ bool startDaemon(const std::string& address, std::string& error) {
     pid_t pid;
     const int result = posix_spawnp(&pid, arguments[0], &beginning.actions, &beginning.attributes,
                                     const_cast<char**>(arguments), environ);
-    ready.reset();
+    ready.close();
     if (result != 0) {
         error = std::string("can't start dbus-daemon: ") + std::strerror(result);
         return false;
@@ -184,7 +170,7 @@ std::string BusLauncher::getSystemAddress() {
 std::string BusLauncher::startOwn(std::string& error) {
     const std::string directory = RuntimeDirectory::getPath(error);
     if (directory.empty()) return {};
-    const Descriptor lock(lockFile(directory + "/bus.lock", error));
+    const UniqueFD lock(lockFile(directory + "/bus.lock", error));
     if (lock.get() < 0) return {};
     const std::string socket = directory + "/bus";
     const std::string address = addressOf(socket);

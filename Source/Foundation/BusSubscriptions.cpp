@@ -156,7 +156,7 @@ void Bus::noteNameOwnerChanged(const BusMessage& signal) {
 
 void Bus::tellWatchersSoon(const std::string& name, const std::string& oldOwner,
                            const std::string& newOwner) {
-    getLoop()->perform([=, this] { tellWatchers(name, oldOwner, newOwner); });
+    onLaterTurn([=, this] { tellWatchers(name, oldOwner, newOwner); });
 }
 
 void Bus::tellWatchers(const std::string& name, const std::string& oldOwner,

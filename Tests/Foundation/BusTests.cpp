@@ -1,5 +1,6 @@
 #include "Foundation/Bus.h"
 
+#include "Foundation/BusPeer.h"
 #include "Foundation/RunLoop.h"
 #include "Support/LogCapture.h"
 #include "Support/PrivateBus.h"
@@ -20,42 +21,11 @@ constexpr const char* kInterface = "com.tarnwick.orvane.Test";
 constexpr const char* kName = "com.tarnwick.orvane.Test";
 constexpr double kForever = std::numeric_limits<double>::infinity();
 
-/// Another connection to the bus, such as another process would have.
-class Peer {
+class Peer : public BusPeer {
  public:
-    explicit Peer(const PrivateBus& bus) : mConnection(open(bus)) {}
+    using BusPeer::BusPeer;
 
-    static std::unique_ptr<BusConnection> open(const PrivateBus& bus) {
-        std::string error;
-        auto connection = BusConnection::open(bus.getAddress(), error);
-        EXPECT_TRUE(connection) << error;
-        return connection;
-    }
-
-    const std::string& name() const { return mConnection->getUniqueName(); }
-    BusMessage signal(const char* member) {
-        return mConnection->newSignal(kPath, kInterface, member);
-    }
-    void send(BusMessage message) {
-        BusConnection::Messages ignored;
-        EXPECT_TRUE(mConnection->send(message, ignored));
-    }
-    /// Calls a method of the bus itself, after which all that was sent has passed the bus.
-    template <class... Args>
-    BusMessage call(const char* member, const Args&... arguments) {
-        BusMessage message = mConnection->newCall(
-            {"org.freedesktop.DBus", "/org/freedesktop/DBus", "org.freedesktop.DBus", member});
-        (message.append(arguments), ...);
-        return mConnection->call(message, 10);
-    }
-    void own(const char* name) {
-        std::uint32_t result = 0;
-        EXPECT_TRUE(call("RequestName", name, std::uint32_t{4}).read(result));
-        EXPECT_EQ(result, 1u) << "somebody else owns it";
-    }
-
- private:
-    std::unique_ptr<BusConnection> mConnection;
+    BusMessage signal(const char* member) { return BusPeer::signal(kPath, kInterface, member); }
 };
 
 class BusTest : public testing::Test {
@@ -105,7 +75,7 @@ TEST_F(BusTest, DeliversTheSignalsThatMatch) {
     peer.send(peer.signal("One").append("its"));
     peer.send(peer.signal("One").append("it's"));
     peer.send(peer.signal("Other").append("b"));
-    peer.call("GetId");
+    peer.settle();
     settle();
     EXPECT_EQ(heard, std::vector<std::string>({"Any a", "One it's"}));
 }
@@ -117,7 +87,7 @@ TEST_F(BusTest, DropsWhatIsAddressedToItButDoesNotMatch) {
         BusMessage signal = peer.signal("One");
         peer.send(signal.setDestination(bus.getUniqueName()).append("a").append(second));
     }
-    peer.call("GetId");
+    peer.settle();
     settle();
     EXPECT_EQ(heard, std::vector<std::string>({"One a"}));
 }
@@ -127,7 +97,7 @@ TEST_F(BusTest, EndsASubscriptionWithItsHandle) {
     auto any = hear({.interface = kInterface, .member = "Any"});
     any = nullptr;
     peer.send(peer.signal("Any").append("a"));
-    peer.call("GetId");
+    peer.settle();
     settle();
     EXPECT_TRUE(heard.empty());
 }
@@ -181,7 +151,7 @@ TEST_F(BusTest, TakesNamesAndGivesThemBack) {
     EXPECT_FALSE(bus.requestName(kName));
     EXPECT_EQ(bus.getNameOwner(kName), peer.name());
     bus.close();
-    peer.call("ReleaseName", kName);
+    peer.disown(kName);
     EXPECT_EQ(bus.getNameOwner(kName), "") << "a name that was refused is not taken later";
 }
 
@@ -286,9 +256,9 @@ TEST_F(BusTest, RefusesASignalThatIsNotFromItsSender) {
     owner.own(kName);
     const auto any = hear({.sender = kName, .interface = kInterface, .member = "Any"});
     forger.send(forger.signal("Any").append("forged"));
-    forger.call("GetId");
+    forger.settle();
     owner.send(owner.signal("Any").append("true"));
-    owner.call("GetId");
+    owner.settle();
     settle();
     EXPECT_EQ(heard, std::vector<std::string>({"Any true"}));
 }

@@ -1,0 +1,76 @@
+#include "Support/PipedChild.h"
+
+#include <fcntl.h>
+#include <spawn.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <csignal>
+#include <stdexcept>
+
+namespace Support {
+
+namespace {
+
+using Foundation::UniqueFD;
+
+struct Pipe {
+    Pipe() {
+        int fds[2];
+        if (pipe2(fds, O_CLOEXEC) != 0) throw std::runtime_error("pipe2");
+        readEnd = UniqueFD(fds[0]);
+        writeEnd = UniqueFD(fds[1]);
+    }
+    UniqueFD readEnd;
+    UniqueFD writeEnd;
+};
+
+}  // namespace
+
+PipedChild::PipedChild(const std::vector<std::string>& command) {
+    Pipe in;
+    Pipe out;
+    std::vector<char*> arguments;
+    for (const std::string& word : command) {
+        arguments.push_back(const_cast<char*>(word.c_str()));
+    }
+    arguments.push_back(nullptr);
+    posix_spawn_file_actions_t actions;
+    posix_spawn_file_actions_init(&actions);
+    posix_spawn_file_actions_adddup2(&actions, in.readEnd.get(), STDIN_FILENO);
+    posix_spawn_file_actions_adddup2(&actions, out.writeEnd.get(), STDOUT_FILENO);
+    const int error =
+        posix_spawn(&mPID, arguments[0], &actions, nullptr, arguments.data(), environ);
+    posix_spawn_file_actions_destroy(&actions);
+    if (error != 0) throw std::runtime_error("cannot start " + command[0]);
+    mInput = std::move(in.writeEnd);
+    mOutput = std::move(out.readEnd);
+}
+
+PipedChild::~PipedChild() {
+    if (mPID <= 0) return;
+    kill(mPID, SIGKILL);
+    wait();
+}
+
+std::string PipedChild::readLine() {
+    std::string line;
+    for (char c; read(mOutput.get(), &c, 1) == 1 && c != '\n';) {
+        line += c;
+    }
+    return line;
+}
+
+void PipedChild::closeInput() {
+    mInput.close();
+}
+
+int PipedChild::wait() {
+    int status = 0;
+    while (waitpid(mPID, &status, 0) < 0) {
+    }
+    mPID = -1;
+    return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
+}
+
+}  // namespace Support
