@@ -77,6 +77,7 @@ void FileWatch::follow() {
     std::vector<std::string> trail = trailOf(mPath);
     if (trail == mTrail) return;
     std::vector<std::unique_ptr<Monitor>> monitors;
+    monitors.reserve(trail.size());
     for (const std::string& path : trail) {
         monitors.push_back(std::make_unique<Monitor>(this, path));
     }

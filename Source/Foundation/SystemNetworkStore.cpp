@@ -110,8 +110,9 @@ bool SystemNetworkStore::isWatched(const std::string& key) const {
 
 void SystemNetworkStore::drainNetlink() const {
     char message[8192];
-    // Cut or lost messages (ENOBUFS) do no harm, as none is looked at.
-    while (recv(mNetlinkFD.get(), message, sizeof message, 0) >= 0 || errno == ENOBUFS) {
+    // Cut and lost messages do no harm, as none is looked at. The word that some were lost ends
+    // this early; what is left then brings another turn.
+    while (recv(mNetlinkFD.get(), message, sizeof message, 0) >= 0) {
     }
 }
 

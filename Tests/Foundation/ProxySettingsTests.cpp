@@ -28,24 +28,32 @@ std::string protocolSchema(const std::string& name) {
            "</schema>";
 }
 
-/// Settings of the same form as the desktop's, in memory, so that the tests need no desktop.
+/// Settings of the same form as the desktop's, in memory, so that the tests need no desktop. Which
+/// ones are installed is read once in a process, so this comes before every test.
+class TestSettings : public testing::Environment {
+    void SetUp() override {
+        folder.writeFile("test.gschema.xml",
+                         "<schemalist>"
+                         "<schema id='com.tarnwick.test.proxy' path='/test/proxy/'>"
+                         "<key name='mode' type='s'><default>'none'</default></key>"
+                         "<key name='autoconfig-url' type='s'><default>''</default></key>"
+                         "<key name='ignore-hosts' type='as'><default>['localhost']</default>"
+                         "</key></schema>" +
+                             protocolSchema("http") + protocolSchema("https") +
+                             protocolSchema("ftp") + protocolSchema("socks") + "</schemalist>");
+        const std::string command = "glib-compile-schemas " + folder.path().string();
+        ASSERT_EQ(std::system(command.c_str()), 0);
+        setenv("GSETTINGS_SCHEMA_DIR", folder.path().c_str(), 1);
+    }
+
+    TempDir folder;
+};
+
+const testing::Environment* const sTestSettings =
+    testing::AddGlobalTestEnvironment(new TestSettings);
+
 class ProxySettingsTest : public testing::Test {
  protected:
-    static void SetUpTestSuite() {
-        static const TempDir sFolder;
-        sFolder.writeFile("test.gschema.xml",
-                          "<schemalist>"
-                          "<schema id='com.tarnwick.test.proxy' path='/test/proxy/'>"
-                          "<key name='mode' type='s'><default>'none'</default></key>"
-                          "<key name='autoconfig-url' type='s'><default>''</default></key>"
-                          "<key name='ignore-hosts' type='as'><default>['localhost']</default>"
-                          "</key></schema>" +
-                              protocolSchema("http") + protocolSchema("https") +
-                              protocolSchema("ftp") + protocolSchema("socks") + "</schemalist>");
-        const std::string command = "glib-compile-schemas " + sFolder.path().string();
-        ASSERT_EQ(std::system(command.c_str()), 0);
-        setenv("GSETTINGS_SCHEMA_DIR", sFolder.path().c_str(), 1);
-    }
     ~ProxySettingsTest() override {
         g_settings_reset(general, "mode");
         g_settings_reset(general, "autoconfig-url");
