@@ -1,5 +1,6 @@
 #include "Foundation/Switches.h"
 
+#include "Foundation/PreferenceSwitches.h"
 #include "Foundation/Utils.h"
 
 #include <cstring>
@@ -15,7 +16,9 @@ bool GetBoolEnv(const char* name) {
 
 bool GetBoolPref(const char* name, bool defaultValue) {
     char value[101];
-    if (!Compatibility::Utils::copyenv(value, sizeof value, name)) return defaultValue;
+    if (!Compatibility::Utils::copyenv(value, sizeof value, name)) {
+        return PreferenceSwitches::read(name).value_or(defaultValue);
+    }
     return std::strcmp(value, "NO") != 0 && std::strcmp(value, "0") != 0;
 }
 
