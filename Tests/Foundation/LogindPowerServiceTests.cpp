@@ -67,7 +67,7 @@ class LogindPowerServiceTest : public testing::Test {
         const BusMessage answer = bus().call(message, 30);
         ASSERT_TRUE(answer.isValid()) << answer.getErrorText();
     }
-    /// Those that are held, as "what who why mode".
+    /// Those that are held, as "what/who/why/mode".
     static Lines listInhibitors() {
         static constexpr BusMethod kList = methodOf(kInterface, "ListInhibitors");
         BusMessage answer = bus().callMethod(kList);
@@ -78,7 +78,7 @@ class LogindPowerServiceTest : public testing::Test {
             std::string what, who, why, mode;
             EXPECT_TRUE(answer.read(what) && answer.read(who) && answer.read(why) &&
                         answer.read(mode) && answer.skip() && answer.skip() && answer.leave());
-            inhibitors.push_back(what + "/" + who + "/" + why + "/" + mode);
+            inhibitors.push_back(OVFormat("%s/%s/%s/%s", what, who, why, mode));
         }
         return inhibitors;
     }
