@@ -35,6 +35,8 @@ class AbstractTimer : Uncopyable {
     /// Disarms the timer, if it is armed.
     void stop();
 
+    /// Whether the timer is armed.
+    bool isRunning() const { return mTimer.get() != nullptr; }
     /// The seconds until the timer fires, which are negative for one that is late; infinity if it
     /// is not armed or its date is not after the beginning of 2001.
     double getTimeRemaining() const;

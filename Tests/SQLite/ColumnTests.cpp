@@ -1,0 +1,227 @@
+#include "Foundation/AssertionFailure.h"
+#include "Foundation/Logger.h"
+#include "SQLite/StoreTest.h"
+#include "SQLite/UpdateQuery.h"
+
+using namespace Foundation;
+using namespace SQLite;
+using Support::LogCapture;
+using Support::LoggingOn;
+
+namespace {
+
+using ScalarColumnTest = StoreTest;
+using ToOneColumnTest = StoreTest;
+using ToManyColumnTest = StoreTest;
+using UpdateQueryTest = StoreTest;
+
+const ColumnList& listOfTitleAndNumber() {
+    static const ColumnList sColumns = {column<&Item::mNumber>("number"),
+                                        column<&Item::mTitle>("title")};
+    return sColumns;
+}
+
+}  // namespace
+
+TEST_F(ScalarColumnTest, StartsLoadedOnlyInAFreeRow) {
+    EXPECT_TRUE(Item::make("a")->mNumber.isLoaded());
+    const Ref<Item> inTable = Returner<Item>::adopted(new Item(items()));
+    EXPECT_FALSE(inTable->mNumber.isLoaded());
+}
+
+TEST_F(ScalarColumnTest, TheValueThatItHasChangesNothing) {
+    const Ref<Item> item = Item::make("a");
+    item->saveChanges();
+    item->mTitle.setValue(text("a"));
+    item->mNumber.setValue(0);
+    item->mDate.setValue(nullptr);
+    EXPECT_FALSE(item->isChanged());
+    item->mTitle.setValue(text("b"));
+    EXPECT_TRUE(item->isChanged() && item->mTitle.isChanged());
+    EXPECT_FALSE(item->mNumber.isChanged());
+}
+
+TEST_F(ScalarColumnTest, AnyValueChangesAColumnThatIsNotLoaded) {
+    const RowID rowID = saveItem("a");
+    const Ref<Item> item = items()->rowWithID(rowID);
+    item->mTitle.setValue(text("a"));
+    EXPECT_TRUE(item->isChanged());
+    EXPECT_TRUE(item->mTitle.isLoaded());
+    EXPECT_FALSE(item->isLoaded());
+}
+
+TEST_F(ScalarColumnTest, KeepsAChangeThroughALoad) {
+    const RowID rowID = saveItem("a");
+    const Ref<Item> item = items()->rowWithID(rowID);
+    item->mTitle.setValue(text("mine"));
+    EXPECT_EQ(item->mNumber.getValue(), 0);
+    EXPECT_EQ(item->mTitle.getValue()->utf8(), "mine");
+    item->mTitle.setValue(text("a"));
+    EXPECT_TRUE(item->mTitle.isChanged());
+}
+
+TEST_F(ScalarColumnTest, LoadsByNameAndLeavesOutWhatIsMissing) {
+    const RowID rowID = saveItem("a");
+    const Ref<Item> item = items()->rowWithID(rowID);
+    const Cursor cursor(&db(), "select rowID, 6 as number from Items");
+    item->mBig.loadValue(cursor.column("big"));
+    EXPECT_FALSE(item->mBig.isLoaded());
+    item->mNumber.loadValue(cursor.column("number"));
+    EXPECT_TRUE(item->mNumber.isLoaded());
+    EXPECT_EQ(item->mNumber.getValue(), 6);
+}
+
+TEST_F(ScalarColumnTest, KeepsTheOldValueAliveForThePool) {
+    const Ref<Item> item = Item::make("a");
+    String* old = item->mTitle.getValue();
+    item->mTitle.setValue(text("b"));
+    EXPECT_EQ(old->utf8(), "a");
+}
+
+TEST_F(ToOneColumnTest, PointsAtAnUnsavedRowWithoutAFault) {
+    const RowID rowID = saveItem("a");
+    const Ref<Item> item = items()->rowWithID(rowID);
+    const Ref<Note> note = Note::make("n");
+    item->mNote.setValue(note.get());
+    EXPECT_TRUE(static_cast<bool>(item->mNote));
+    EXPECT_FALSE(item->isLoaded());
+    EXPECT_EQ(item->mNote.getValue(), note.get());
+    EXPECT_EQ(item->mNote.getRowID(), 0);
+    item->mNote.setValue(nullptr);
+    EXPECT_FALSE(static_cast<bool>(item->mNote));
+    EXPECT_EQ(item->mNote.getValue(), nullptr);
+}
+
+TEST_F(ToOneColumnTest, OwnsAnUnsavedChildButNotAParent) {
+    const Ref<Item> item = Item::make("a");
+    const Ref<Note> note = Note::make("n");
+    const Ref<Group> group = Group::make("g");
+    item->mNote.setValue(note.get());
+    item->mOwner.setValue(group.get());
+    EXPECT_EQ(note->getRefCount(), 2U);
+    EXPECT_EQ(group->getRefCount(), 1U);
+    item->mNote.setValue(nullptr);
+    item->mOwner.setValue(nullptr);
+    EXPECT_EQ(note->getRefCount(), 1U);
+    EXPECT_EQ(group->getRefCount(), 1U);
+}
+
+TEST_F(ToOneColumnTest, SavesWhatItPointsAtFirst) {
+    const Ref<Item> item = Item::make("a");
+    {
+        const AutoreleasePool inner;
+        item->mNote.setValue(Note::make("n").get());
+    }
+    const Ref<Group> group = Group::make("g");
+    item->mOwner.setValue(group.get());
+    item->saveChanges();
+    EXPECT_EQ(item->mNote.getRowID(), 1);
+    EXPECT_EQ(group->getRowID(), 1);
+    EXPECT_EQ(count("note=1 and owner=1"), 1);
+    EXPECT_FALSE(item->mNote.isChanged());
+    EXPECT_EQ(item->mNote.getValue()->mBody.getValue()->utf8(), "n");
+    EXPECT_EQ(group->getRefCount(), 2U);
+    EXPECT_EQ(item->mOwner.getValue(), group.get());
+}
+
+TEST_F(ToOneColumnTest, FindsTheRowByItsID) {
+    const Ref<Note> note = Note::make("n");
+    note->saveChanges();
+    const Ref<Item> item = Item::make("a");
+    item->mNote.setValue(note.get());
+    item->saveChanges();
+    const RowID rowID = item->getRowID();
+    item->unload();
+    EXPECT_TRUE(static_cast<bool>(item->mNote));
+    EXPECT_EQ(item->mNote.getValue(), note.get());
+    item->mNote.setValue(note.get());
+    EXPECT_FALSE(item->isChanged());
+    item->mNote.setValue(nullptr);
+    item->saveChanges();
+    EXPECT_EQ(db().execScalar("select note=0 from Items where rowID=%lld", rowID), 1);
+}
+
+namespace {
+
+/// A row that never gets an ID.
+class NoRow : public Row {
+ public:
+    NoRow() : Row(static_cast<Table*>(nullptr)) {}
+    void saveChanges() override {}
+    RowID doInsert() override { return 0; }
+    void doUpdate() override {}
+};
+
+}  // namespace
+
+TEST_F(ToOneColumnTest, NeedsARowThatGetsAnID) {
+    const LogCapture log;
+    const Ref<Item> item = Item::make("a");
+    const Ref<NoRow> row = Returner<NoRow>::adopted(new NoRow);
+    static_cast<BasicToOneColumn&>(item->mNote).setValue(row.get(), true);
+    try {
+        item->mNote.saveChanges(notes());
+        FAIL();
+    } catch (const AssertionFailure& failure) {
+        EXPECT_STREQ(failure.what(), "BasicToOneColumn can't get dst rowID");
+    }
+    item->mNote.setValue(nullptr);
+    notes()->uncacheRows();
+}
+
+TEST_F(ToManyColumnTest, KeepsEachNewRowOnceInOrder) {
+    const Ref<Group> group = Group::make("g");
+    const Ref<Item> a = Item::make("a");
+    const Ref<Item> b = Item::make("b");
+    const Ref<Item> c = Item::make("c");
+    for (const Ref<Item>& item : {a, b, a, c}) {
+        group->mItems.add(item.get());
+    }
+    EXPECT_EQ(group->mItems.getNewRows().size(), 3U);
+    EXPECT_TRUE(group->mItems.remove(a.get()));
+    EXPECT_FALSE(group->mItems.remove(a.get()));
+    EXPECT_EQ(group->mItems.getNewRows().at(0).get(), b.get());
+    EXPECT_EQ(group->mItems.getNewRows().at(1).get(), c.get());
+    EXPECT_STREQ(group->mItems.getForeignKey(), "owner");
+}
+
+TEST_F(ToManyColumnTest, SavesItsRowsBehindTheOwner) {
+    const Ref<Group> group = Group::make("g");
+    {
+        const AutoreleasePool inner;
+        for (const char* title : {"a", "b"}) {
+            const Ref<Item> item = Item::make(title);
+            item->mOwner.setValue(group.get());
+            group->mItems.add(item.get());
+        }
+    }
+    group->saveChanges();
+    EXPECT_EQ(count("owner=1"), 2);
+    EXPECT_TRUE(group->mItems.getNewRows().empty());
+    EXPECT_EQ(items()->getCachedRowCount(), 0U);
+}
+
+TEST_F(UpdateQueryTest, WritesOnlyWhatChanged) {
+    const Ref<Item> item = Item::make("a");
+    item->saveChanges();
+    executeElsewhere("update Items set real=1.5");
+    item->mTitle.setValue(text("b"));
+    item->mNumber.setValue(3);
+    UpdateQuery query(item.get(), listOfTitleAndNumber());
+    EXPECT_STREQ(query.getSQL(), "update Items set number=?, title=? where rowID=1");
+    EXPECT_EQ(query.execute(), 1);
+    EXPECT_EQ(count("title='b' and number=3 and real=1.5"), 1);
+    item->mNumber.clearChanged();
+    EXPECT_STREQ(UpdateQuery(item.get(), listOfTitleAndNumber()).getSQL(),
+                 "update Items set title=? where rowID=1");
+}
+
+TEST_F(UpdateQueryTest, RunsNoSQLWithoutAChange) {
+    const Ref<Item> item = Item::make("a");
+    item->saveChanges();
+    const LoggingOn on({&gLogSQL, &gLogPersist});
+    LogCapture log;
+    EXPECT_EQ(UpdateQuery(item.get(), listOfTitleAndNumber()).execute(), 0);
+    EXPECT_EQ(log.lines(),
+              std::vector<std::string>{"[Persist] UpdateQuery found no changed columns; no-op"});
+}

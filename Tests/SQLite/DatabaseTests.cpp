@@ -1,0 +1,516 @@
+#include "SQLite/Database.h"
+
+#include "Foundation/AssertionFailure.h"
+#include "Foundation/NotificationRecorder.h"
+#include "Foundation/Number.h"
+#include "Foundation/RunLoop.h"
+#include "Foundation/URL.h"
+#include "SQLite/Exception.h"
+#include "SQLite/SQLFunctionPort.h"
+#include "SQLite/Statement.h"
+#include "SQLite/StoreTest.h"
+#include "SQLite/Transaction.h"
+
+#include <fcntl.h>
+#include <sqlite3.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <thread>
+
+using namespace Foundation;
+using namespace SQLite;
+using Support::LogCapture;
+using Support::LoggingOn;
+
+namespace {
+
+using DatabaseTest = StoreTest;
+
+template <class Body>
+int codeOf(Body&& body) {
+    try {
+        body();
+    } catch (const Exception& exception) {
+        return exception.getCode();
+    }
+    return 0;
+}
+
+template <class Body>
+std::string assertionOf(Body&& body) {
+    try {
+        body();
+    } catch (const AssertionFailure& failure) {
+        return failure.what();
+    }
+    return "none";
+}
+
+/// Holds a lock on a file as another process would.
+class Locker {
+ public:
+    Locker(const std::string& path, const char* sql) {
+        sqlite3_open(path.c_str(), &mDB);
+        sqlite3_exec(mDB, sql, nullptr, nullptr, nullptr);
+    }
+    ~Locker() { sqlite3_close(mDB); }
+
+ private:
+    sqlite3* mDB = nullptr;
+};
+
+class Doubler : public SQLFunctionPort {
+ public:
+    Doubler() { setCurrent(this); }
+    ~Doubler() override { setCurrent(nullptr); }
+    void installFunctions(SQLFunctionInstaller& installer) override {
+        installer.add("twice", -1, [](SQLFunctionCall& call) {
+            if (call.getArgumentCount() != 1) throw std::runtime_error("one, please");
+            if (!call.getText(0)) return call.setNullResult();
+            call.setResult(2 * call.getInteger(0));
+        });
+    }
+};
+
+}  // namespace
+
+TEST_F(DatabaseTest, OpensAFileWithItsSettings) {
+    EXPECT_TRUE(db().isOpen());
+    EXPECT_TRUE(db().isWriteable());
+    EXPECT_EQ(db().getBusyTimeout(), 25000);
+    EXPECT_EQ(db().execScalar("PRAGMA temp_store"), 2);
+    EXPECT_EQ(db().execScalar("PRAGMA trusted_schema"), 0);
+    EXPECT_EQ(db().execScalar("PRAGMA cell_size_check"), 1);
+    EXPECT_EQ(db().getLocation()->getFileSystemRepresentation(), path);
+    // Writing the schema by hand is refused.
+    db().execute("PRAGMA writable_schema = 1");
+    EXPECT_NE(codeOf([] { db().execute("delete from sqlite_master"); }), 0);
+}
+
+TEST_F(DatabaseTest, CountsAGenerationForEachOpenAndClose) {
+    const std::uint32_t first = db().getGeneration();
+    db().close(false);
+    EXPECT_EQ(db().getGeneration(), first + 1);
+    db().close(false);
+    EXPECT_EQ(db().getGeneration(), first + 1);
+    db().open(path.c_str(), true);
+    EXPECT_EQ(db().getGeneration(), first + 2);
+    EXPECT_EQ(Database().getGeneration(), 1U);
+}
+
+TEST_F(DatabaseTest, OpensInMemoryForANullPath) {
+    const LoggingOn on({});
+    LogCapture log;
+    Database memory;
+    memory.open(static_cast<const char*>(nullptr), true);
+    EXPECT_TRUE(log.contains("*** Opening database :memory:"));
+    EXPECT_EQ(memory.getLocation(), nullptr);
+    EXPECT_EQ(memory.execScalar("select 3"), 3);
+    EXPECT_EQ(assertionOf([&] { memory.setPostsNotifications(true); }), "mLocation");
+}
+
+TEST_F(DatabaseTest, OpensTheFileOfAURL) {
+    Database other;
+    const Ref<URL> url = URL::urlWithFileSystemPath(path.c_str(), false);
+    other.open(url.get(), false);
+    EXPECT_EQ(other.execScalar("select count(*) from Items"), 0);
+    other.close(false);
+    const Ref<URL> remote = URL::url(text("http://example.org/a"));
+    EXPECT_EQ(assertionOf([&] { other.open(remote.get(), true); }), "filePath");
+    EXPECT_EQ(assertionOf([&] { other.open(static_cast<URL*>(nullptr), true); }), "filePath");
+}
+
+TEST_F(DatabaseTest, RefusesASecondOpen) {
+    const LogCapture log;
+    EXPECT_EQ(assertionOf([] { db().open("/x", true); }), "Database already open!");
+}
+
+TEST_F(DatabaseTest, RefusesUseWhileClosed) {
+    LogCapture log;
+    const Database closed;
+    EXPECT_EQ(assertionOf([&] { closed.db(); }), "Database not open");
+    EXPECT_TRUE(log.contains("sqlite3 *SQLite::Database::db() const"));
+}
+
+TEST_F(DatabaseTest, ReadsOnlyFilesThatExist) {
+    const LogCapture log;
+    Database reader;
+    const std::string missing = directory / "missing";
+    try {
+        reader.open(missing.c_str(), false);
+        FAIL();
+    } catch (const Exception& exception) {
+        EXPECT_STREQ(exception.what(), "SQLITE_CANTOPEN[14.0]: Database file not found");
+    }
+    EXPECT_NE(access(missing.c_str(), F_OK), 0);
+    reader.open(missing.c_str(), true);
+    EXPECT_EQ(reader.execScalar("select 1"), 1);
+}
+
+TEST_F(DatabaseTest, IsClosedAfterAnOpenThatFails) {
+    const LogCapture log;
+    Database other;
+    EXPECT_EQ(codeOf([&] { other.open((directory / "no/such/folder").c_str(), true); }) & 0xFF, 14);
+    EXPECT_FALSE(other.isOpen());
+    EXPECT_EQ(other.getLocation(), nullptr);
+    other.open(path.c_str(), true);
+    EXPECT_TRUE(other.isOpen());
+}
+
+TEST_F(DatabaseTest, KeepsAutoVacuumWhenItTurnsToTheWriteAheadLog) {
+    Database fresh;
+    fresh.open((directory / "fresh").c_str(), true);
+    fresh.execute("PRAGMA auto_vacuum = INCREMENTAL");
+    EXPECT_TRUE(fresh.useWriteAheadLog());
+    fresh.execute("create table t (a)");
+    EXPECT_EQ(fresh.execScalar("PRAGMA auto_vacuum"), 2);
+    EXPECT_EQ(fresh.execScalar("PRAGMA synchronous"), 2);
+    const Cursor mode(&fresh, "PRAGMA journal_mode");
+    EXPECT_STREQ(mode.cStringColumn(0), "wal");
+}
+
+TEST_F(DatabaseTest, KeepsTheRollBackJournalWhereThereIsNoWriteAheadLog) {
+    Database memory;
+    memory.open(static_cast<const char*>(nullptr), true);
+    EXPECT_FALSE(memory.useWriteAheadLog());
+    EXPECT_EQ(memory.execScalar("PRAGMA synchronous"), 2);
+}
+
+TEST_F(DatabaseTest, KeepsTheRollBackJournalWhileSomebodyReads) {
+    const LogCapture log;
+    const Locker reader(path, "begin; select * from Items");
+    const Locker holder(path, "begin immediate");
+    EXPECT_FALSE(db().useWriteAheadLog());
+    clock.advanceBy(1);
+    EXPECT_FALSE(log.contains("DBFatalErr"));
+}
+
+namespace {
+
+struct DeniedCase {
+    const char* sql;
+    int action;
+};
+class DatabaseAuthorizer : public StoreTest, public testing::WithParamInterface<DeniedCase> {};
+
+}  // namespace
+
+TEST_P(DatabaseAuthorizer, DeniesChangesToAReader) {
+    db().execute("create table t (a); create index i on t (a); create table u (a)");
+    db().execute("create trigger g after insert on u begin select 1; end");
+    reopen(false);
+    // A reader that has not read the schema yet is told that it changed.
+    ASSERT_EQ(count("1"), 0);
+    LogCapture log;
+    EXPECT_EQ(codeOf([] { db().execute("%s", GetParam().sql); }), 23);
+    EXPECT_TRUE(
+        log.contains("[WARNING] Database: Illegal operation on read-only database "
+                     "(action=" +
+                     std::to_string(GetParam().action) + ", p1='"));
+}
+
+INSTANTIATE_TEST_SUITE_P(
+    All, DatabaseAuthorizer,
+    testing::Values(DeniedCase{"delete from t where a=1", 9},
+                    DeniedCase{"insert into t values (1)", 18}, DeniedCase{"update t set a=1", 23},
+                    DeniedCase{"alter table t add column b", 26}, DeniedCase{"reindex i", 27},
+                    DeniedCase{"create table v (a)", 2}, DeniedCase{"create index j on t (a)", 1},
+                    DeniedCase{"drop index i", 10}, DeniedCase{"drop trigger g", 16},
+                    DeniedCase{"drop table t", 11},
+                    DeniedCase{"create trigger h after insert on t begin select 1; end", 7}));
+
+TEST_F(DatabaseTest, LetsAReaderMakeTemporaryObjects) {
+    reopen(false);
+    db().execute("create temporary view v as select 1 as a");
+    EXPECT_EQ(db().execScalar("select a from v"), 1);
+    EXPECT_EQ(db().execScalar("select count(*) from Items"), 0);
+}
+
+TEST_F(DatabaseTest, LetsAReaderCreateAView) {
+    reopen(false);
+    db().execute("create view v as select 7 as a");
+    EXPECT_EQ(db().execScalar("select a from v"), 7);
+}
+
+TEST_F(DatabaseTest, DoesNotLetAReaderWriteTheSchemaByHand) {
+    reopen(false);
+    const LogCapture log;
+    db().execute("PRAGMA writable_schema = 1");
+    EXPECT_NE(codeOf([] { db().execute("delete from sqlite_master"); }), 0);
+}
+
+TEST_F(DatabaseTest, ReadsAndWritesTheUserVersion) {
+    EXPECT_EQ(db().getUserVersion(), 0);
+    db().setUserVersion(10022);
+    EXPECT_EQ(db().getUserVersion(), 10022);
+    EXPECT_EQ(db().execScalar("PRAGMA user_version"), 10022);
+}
+
+TEST_F(DatabaseTest, ExecutesFormattedTextsAndCountsChanges) {
+    EXPECT_EQ(db().execute("insert into Items (title) values (%Q), (%Q)", "it's", "b"), 2);
+    EXPECT_EQ(db().execScalar("select count(*) from Items where title='%q'", "it's"), 1);
+    EXPECT_EQ(db().lastInsertedRowID(), 2);
+    const LogCapture log;
+    EXPECT_EQ(assertionOf([] { db().execScalar("select 1 where 0"); }), "Cursor has no more rows");
+}
+
+TEST_F(DatabaseTest, DropsAnIndexThatMayNotBeThere) {
+    items()->addIndex("Items_title", "title");
+    EXPECT_EQ(db().execScalar("select count(*) from sqlite_master where name='Items_title'"), 1);
+    db().dropIndex("Items_title");
+    db().dropIndex("Items_title");
+    EXPECT_EQ(db().execScalar("select count(*) from sqlite_master where name='Items_title'"), 0);
+}
+
+TEST_F(DatabaseTest, FindsTablesByNameInTheOrderOfFirstUse) {
+    EXPECT_EQ(db().getRegisteredTable("Items"), items());
+    EXPECT_EQ(db().getRegisteredTable("items"), nullptr);
+}
+
+TEST_F(DatabaseTest, TriesTransientErrorsThreeTimes) {
+    const LogCapture log;
+    const std::string attach = "attach '" + (directory / "no/such/folder") + "' as other";
+    EXPECT_EQ(codeOf([&] { db().execute("%s", attach); }), 14);
+    EXPECT_DOUBLE_EQ(clock.slept(), 0.4 + 0.9);
+}
+
+TEST_F(DatabaseTest, DoesNotTryOtherErrorsAgain) {
+    const LogCapture log;
+    EXPECT_EQ(codeOf([] { db().execute("nonsense"); }), 1);
+    EXPECT_TRUE(log.contains("in \"nonsense\""));
+    EXPECT_EQ(clock.slept(), 0);
+}
+
+TEST_F(DatabaseTest, WaitsForLocksOnTheClockAndNoLongerThanTheTimeOut) {
+    const LogCapture log;
+    const Locker locker(path, "begin exclusive");
+    EXPECT_EQ(codeOf([] { db().execute("insert into Items (title) values ('a')"); }), 5);
+    EXPECT_NEAR(clock.slept(), 25.0, 0.001);
+}
+
+TEST_F(DatabaseTest, ChecksResultCodes) {
+    const LogCapture log;
+    db().check(0);
+    EXPECT_EQ(codeOf([] { db().check(1); }), 1);
+}
+
+TEST_F(DatabaseTest, LogsWhatItRunsInAndOutOfTransactions) {
+    const LoggingOn on({&gLogSQL});
+    LogCapture log;
+    db().execute("update Items set number=1");
+    EXPECT_TRUE(log.contains("[SQL] Exec update Items set number=1  -->0 [0.000 sec]"));
+    db().beginTransaction(true);
+    EXPECT_TRUE(log.contains("[SQL] >>>> BEGIN IMMEDIATE TRANSACTION"));
+    db().execute("update Items set number=2");
+    EXPECT_TRUE(log.contains("[SQL] Exec ( update Items set number=2  -->0 ) [0.000 sec]"));
+    clock.jumpTo(clock.now() + 1.5);
+    db().endTransaction();
+    EXPECT_TRUE(log.contains("[SQL] <<<< END TRANSACTION (1.500 sec)"));
+    db().beginTransaction(false);
+    db().endTransaction();
+    EXPECT_TRUE(log.contains("[SQL] >>>> BEGIN DEFERRED TRANSACTION"));
+}
+
+TEST_F(DatabaseTest, NumbersStatementsWhileTheyAreLogged) {
+    db().compile("select 1");
+    const LoggingOn on({&gLogSQL});
+    LogCapture log;
+    db().compile("select 2");
+    db().compile("select 3");
+    ASSERT_EQ(log.count("Prepare #"), 2);
+    const std::string first = log.lines().at(0);
+    EXPECT_TRUE(log.contains(": \"select 2\" --> 0x"));
+    EXPECT_EQ(first.substr(0, 15), "[SQL] Prepare #");
+}
+
+TEST_F(DatabaseTest, CompilesOneStatementPerText) {
+    const LogCapture log;
+    EXPECT_EQ(assertionOf([] { db().compile(nullptr); }), "NULL SQL string");
+    EXPECT_EQ(assertionOf([] { db().compile("-- nothing"); }), "Empty SQL statement");
+    EXPECT_EQ(assertionOf([] { db().compile("select 1; select 2"); }),
+              "Excess characters past end of SQL statement");
+    EXPECT_EQ(codeOf([] { db().compile("selec 1"); }), 1);
+    EXPECT_TRUE(log.contains("in \"selec 1\""));
+}
+
+TEST_F(DatabaseTest, ChecksTheFile) {
+    const LoggingOn on({});
+    LogCapture log;
+    db().integrityCheck();
+    EXPECT_TRUE(log.contains("*** Performing integrity_check on database"));
+    EXPECT_TRUE(log.contains("*** Passed integrity_check on database"));
+}
+
+TEST_F(DatabaseTest, ReportsABrokenFileAsFatal) {
+    db().execute("create table t (a); create index i on t (a); insert into t values (1), (2)");
+    const int root = db().execScalar("select rootpage from sqlite_master where name='i'");
+    const int size = db().execScalar("PRAGMA page_size");
+    db().close(false);
+    {
+        // An empty index: its rows are missing.
+        const int file = ::open(path.c_str(), O_RDWR);
+        const char header[] = {
+            10, 0, 0, 0, 0, static_cast<char>(size >> 8), static_cast<char>(size & 0xFF), 0};
+        ASSERT_EQ(pwrite(file, header, sizeof header, static_cast<off_t>(root - 1) * size), 8);
+        ::close(file);
+    }
+    db().open(path.c_str(), true);
+    const LoggingOn on({});
+    LogCapture log;
+    NotificationRecorder fatal;
+    NotificationCenter::getLocal()->addObserver(fatal, Database::kDatabaseFatalErrorNotification,
+                                                &db());
+    EXPECT_EQ(codeOf([] { db().integrityCheck(); }), 11);
+    EXPECT_TRUE(log.contains("[WARNING] *** SQLite integrity check failed! Details:"));
+    EXPECT_TRUE(log.contains("[WARNING]     row 1 missing from index i"));
+    EXPECT_TRUE(
+        log.contains("*** SQLite integrity check failed -- exception "
+                     "SQLITE_CORRUPT[11.0]: integrity check failed"));
+    EXPECT_TRUE(fatal.notes.empty());
+    clock.advanceBy(0);
+    EXPECT_EQ(fatal.notes.size(), 1U);
+    NotificationCenter::getLocal()->removeObserver(fatal);
+}
+
+TEST_F(DatabaseTest, AnnouncesAFatalErrorOncePerBurst) {
+    const LogCapture log;
+    NotificationRecorder fatal;
+    NotificationCenter::getLocal()->addObserver(fatal, Database::kDatabaseFatalErrorNotification,
+                                                &db());
+    EXPECT_EQ(codeOf([] { db()._throwQueryException(Exception(19, "not fatal")); }), 19);
+    clock.advanceBy(0);
+    EXPECT_TRUE(fatal.notes.empty());
+    EXPECT_EQ(codeOf([] { db()._throwQueryException(Exception(11, "first")); }), 11);
+    EXPECT_EQ(codeOf([] { db()._throwQueryException(Exception(26, "second")); }), 26);
+    clock.advanceBy(0);
+    ASSERT_EQ(fatal.notes.size(), 1U);
+    EXPECT_EQ(Number::getInteger(fatal.lastInfo->getAs<Number>("error")), 11);
+    EXPECT_EQ(fatal.lastInfo->getAs<String>("message")->utf8(), "SQLITE_CORRUPT[11.0]: first");
+    EXPECT_EQ(codeOf([] { db()._throwQueryException(Exception(5, "third")); }), 5);
+    clock.advanceBy(0);
+    EXPECT_EQ(fatal.notes.size(), 2U);
+    NotificationCenter::getLocal()->removeObserver(fatal);
+}
+
+TEST_F(DatabaseTest, VacuumsOnlyWhatIsMoreThan256FreePages) {
+    Database fresh;
+    fresh.open((directory / "fresh").c_str(), true);
+    // In this order: the mode of auto_vacuum fixes the size of a page.
+    fresh.execute("PRAGMA page_size = 1024");
+    fresh.execute("PRAGMA auto_vacuum = INCREMENTAL");
+    fresh.execute("create table t (a); create table u (a)");
+    // A page for each row of u, so that the number of free pages can be chosen.
+    fresh.execute(
+        "with n(i) as (select 1 union all select i+1 from n where i<400) "
+        "insert into u select zeroblob(900) from n");
+    const auto freePages = [&](int pages) {
+        for (int i = 0; i < 400 && fresh.execScalar("PRAGMA freelist_count") < pages; ++i) {
+            fresh.execute("delete from u where rowid=(select max(rowid) from u)");
+        }
+    };
+    freePages(256);
+    ASSERT_EQ(fresh.execScalar("PRAGMA freelist_count"), 256);
+    fresh.vacuumIncrementally();
+    EXPECT_EQ(fresh.execScalar("PRAGMA freelist_count"), 256);
+    freePages(257);
+    const LoggingOn on({});
+    LogCapture log;
+    fresh.vacuumIncrementally();
+    EXPECT_EQ(fresh.execScalar("PRAGMA freelist_count"), 0);
+    EXPECT_TRUE(log.contains("Incremental vacuum reclaimed 257 free pages in 0ms."));
+}
+
+TEST_F(DatabaseTest, AnnouncesThatItCloses) {
+    const LoggingOn on({});
+    LogCapture log;
+    NotificationRecorder closing;
+    NotificationCenter::getLocal()->addObserver(closing, Database::kDatabaseClosingNotification,
+                                                &db());
+    const Ref<Item> item = Item::make("a");
+    item->addToTable(items());
+    closing.also = [](Notification*) {
+        EXPECT_EQ(db().execScalar("select count(*) from Items"), 0);
+    };
+    db().close(true);
+    EXPECT_EQ(closing.notes, std::vector<std::string>{"com.tarnwick.orvane.DBClosing"});
+    EXPECT_TRUE(log.contains("*** Closing database"));
+    EXPECT_FALSE(db().isOpen());
+    db().close(true);
+    EXPECT_EQ(closing.notes.size(), 1U);
+    NotificationCenter::getLocal()->removeObserver(closing);
+    db().open(path.c_str(), true);
+    EXPECT_EQ(count("title='a'"), 1);
+}
+
+TEST_F(DatabaseTest, StopsItsTimersWhenItCloses) {
+    db().saveRowsSoon();
+    db().execute("insert into Items (title) values ('a')");
+    db().close(false);
+    db().open(path.c_str(), true);
+    clock.advanceBy(10);
+    EXPECT_TRUE(platform.posts.empty());
+}
+
+TEST_F(DatabaseTest, EndsStatementsThatOthersHoldWhenItCloses) {
+    Query query(&db(), "select 1");
+    query.statement();
+    Cursor cursor(query);
+    db().close(false);
+    const LogCapture log;
+    EXPECT_THROW(cursor.nextRow(), AssertionFailure);
+    EXPECT_THROW(cursor.intColumn(0), AssertionFailure);
+    // Nothing is left of the connection: the file may be deleted and made anew.
+    std::filesystem::remove(path);
+    db().open(path.c_str(), true);
+    EXPECT_EQ(db().execScalar("select count(*) from sqlite_master"), 0);
+}
+
+TEST_F(DatabaseTest, PostsThatItWasReplaced) {
+    const LoggingOn on({});
+    LogCapture log;
+    db().postReplacedNotification();
+    ASSERT_EQ(platform.posts.size(), 1U);
+    EXPECT_EQ(platform.posts[0].name, "com.tarnwick.orvane.DBReplaced");
+    EXPECT_EQ(platform.posts[0].object, "Orvane Agent");
+    EXPECT_EQ(platform.posts[0].info.get(), nullptr);
+    EXPECT_TRUE(platform.posts[0].isUrgent);
+    EXPECT_TRUE(log.contains("===== Database posting distributed 'Replaced' notification"));
+}
+
+TEST_F(DatabaseTest, InstallsTheFunctionsOfThePort) {
+    const Doubler port;
+    reopen(true);
+    EXPECT_EQ(db().execScalar("select twice(21)"), 42);
+    EXPECT_EQ(db().execScalar("select twice(null) is null"), 1);
+    // The schema may not call it.
+    db().execute("create view v as select twice(1) as a");
+    LogCapture log;
+    EXPECT_EQ(codeOf([] { db().execScalar("select a from v"); }), 1);
+    EXPECT_TRUE(log.contains("unsafe use of twice()"));
+    // What it throws is reported and goes no further.
+    EXPECT_EQ(db().execScalar("select twice(1, 2) is null"), 1);
+    EXPECT_TRUE(log.contains("one, please"));
+}
+
+#ifndef NDEBUG
+TEST_F(DatabaseTest, NoticesUseOnAnotherThread) {
+    const LogCapture log;
+    std::string message;
+    std::thread other([&] { message = assertionOf([] { db()._checkThread(); }); });
+    other.join();
+    EXPECT_EQ(message, "Database used on another thread than the one that opened it");
+}
+
+TEST_F(DatabaseTest, NoticesAReadersCursorThatMeetsATurnOfTheRunLoop) {
+    saveItem("a");
+    reopen(false);
+    LogCapture log;
+    { const Cursor brief(&db(), "select * from Items"); }
+    clock.advanceBy(0);
+    EXPECT_FALSE(log.contains("Cursor lives across"));
+    const Cursor cursor(&db(), "select * from Items");
+    clock.advanceBy(0);
+    EXPECT_TRUE(log.contains("Cursor lives across a turn of the run loop"));
+}
+#endif

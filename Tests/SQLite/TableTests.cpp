@@ -1,0 +1,255 @@
+#include "SQLite/Table.h"
+
+#include "Foundation/AssertionFailure.h"
+#include "Foundation/Logger.h"
+#include "SQLite/CursorOf.h"
+#include "SQLite/Exception.h"
+#include "SQLite/StoreTest.h"
+#include "SQLite/Transaction.h"
+
+using namespace Foundation;
+using namespace SQLite;
+using Support::LogCapture;
+using Support::LoggingOn;
+
+namespace {
+
+class TableTest : public StoreTest {
+ protected:
+    /// Saves groups of the names "1" and so on.
+    static void saveGroups(int first, int last) {
+        for (int i = first; i <= last; ++i) {
+            const AutoreleasePool inner;
+            Group::make(std::to_string(i).c_str())->saveChanges();
+        }
+    }
+    static int object(const char* type, const char* name) {
+        return db().execScalar("select count(*) from sqlite_master where type=%Q and name=%Q", type,
+                               name);
+    }
+};
+
+template <class Body>
+std::string assertionOf(Body&& body) {
+    try {
+        body();
+    } catch (const AssertionFailure& failure) {
+        return failure.what();
+    }
+    return "none";
+}
+
+}  // namespace
+
+TEST_F(TableTest, NeedsADatabaseAndAName) {
+    const LogCapture log;
+    EXPECT_EQ(assertionOf([] { TableOf<Item>(nullptr, "x", true, true); }),
+              "NULL db in Table constructor");
+    EXPECT_EQ(assertionOf([] { TableOf<Item>(&db(), nullptr, true, true); }),
+              "NULL name in Table constructor");
+}
+
+TEST_F(TableTest, RegistersWhileItLives) {
+    {
+        const TableOf<Item> table(&db(), "Extra", false, false);
+        EXPECT_EQ(db().getRegisteredTable("Extra"), &table);
+    }
+    EXPECT_EQ(db().getRegisteredTable("Extra"), nullptr);
+}
+
+TEST_F(TableTest, CreatesItselfWithIndexesAndTriggersOnce) {
+    static constexpr Table::IndexSpec kIndexes[] = {
+        {"Extra_a", "a"}, {"Extra_ab", "a, b"}, {nullptr, nullptr}};
+    static constexpr Table::TriggerSpec kTriggers[] = {
+        {"Extra_t", "AFTER INSERT", "BEGIN UPDATE Items SET number=1; END"},
+        {nullptr, nullptr, nullptr}};
+    TableOf<Item> table(&db(), "Extra", false, false);
+    table.create("rowID integer primary key, a, b", kIndexes, kTriggers);
+    EXPECT_EQ(object("table", "Extra"), 1);
+    EXPECT_EQ(object("index", "Extra_a") + object("index", "Extra_ab"), 2);
+    EXPECT_EQ(object("trigger", "Extra_t"), 1);
+    // A table that is there is left alone, indexes and all.
+    db().dropIndex("Extra_a");
+    table.create("other", kIndexes, kTriggers);
+    EXPECT_EQ(object("index", "Extra_a"), 0);
+    table.addColumn("c", "text");
+    EXPECT_EQ(db().execScalar("select count(*) from pragma_table_info('Extra')"), 4);
+}
+
+TEST_F(TableTest, HandsOutOneObjectForARow) {
+    const RowID rowID = saveItem("a");
+    const LoggingOn on({&gLogPersist});
+    LogCapture log;
+    const Ref<Item> item = items()->rowWithID(rowID);
+    EXPECT_EQ(Ref<Item>(items()->rowWithID(rowID)).get(), item.get());
+    EXPECT_EQ(items()->cachedRowWithID(rowID), item.get());
+    EXPECT_TRUE(item->isCached());
+    EXPECT_FALSE(item->isRetained());
+    EXPECT_TRUE(log.contains(
+        OVFormat("[Persist] Table Items: mCacheAllRows is set.  Caching row #1 [%p]", item.get())));
+    EXPECT_EQ(assertionOf([] { (void)items()->rowWithID(0); }), "rowID>0");
+}
+
+TEST_F(TableTest, LetsRowsGoThatItDoesNotRetain) {
+    const RowID rowID = saveItem("a");
+    { const Ref<Item> item = items()->rowWithID(rowID); }
+    EXPECT_EQ(items()->getCachedRowCount(), 0U);
+    saveGroups(1, 1);
+    EXPECT_EQ(groups()->getCachedRowCount(), 1U);
+    EXPECT_TRUE(groups()->cachedRowWithID(1)->isRetained());
+}
+
+TEST_F(TableTest, WithoutACacheHandsOutNewObjects) {
+    const RowID rowID = saveItem("a");
+    TableOf<Item> table(&db(), "Items", false, true);
+    const Ref<Item> first = table.rowWithID(rowID);
+    const Ref<Item> second = table.rowWithID(rowID);
+    EXPECT_NE(first.get(), second.get());
+    EXPECT_FALSE(first->isCached());
+    EXPECT_STREQ(table._colsToFetch(), "*");
+}
+
+TEST_F(TableTest, KeepsAChangedRowUntilItIsSaved) {
+    const RowID rowID = saveItem("a");
+    {
+        const AutoreleasePool inner;
+        const Ref<Item> item = items()->rowWithID(rowID);
+        item->mNumber.setValue(3);
+        EXPECT_TRUE(item->isRetained());
+    }
+    EXPECT_EQ(items()->getCachedRowCount(), 1U);
+    EXPECT_TRUE(items()->isChanged());
+    db().saveRows();
+    EXPECT_EQ(items()->getCachedRowCount(), 0U);
+    EXPECT_FALSE(items()->isChanged());
+    EXPECT_EQ(count("number=3"), 1);
+}
+
+TEST_F(TableTest, FetchesOnlyIDsOnceARetainingTableIsWarm) {
+    saveGroups(1, 4);
+    EXPECT_STREQ(groups()->_colsToFetch(), "*");
+    EXPECT_STREQ(groups()->rowsWhere("1")->getSQL(), "SELECT * FROM Groups WHERE 1");
+    saveGroups(5, 5);
+    EXPECT_STREQ(groups()->rowsWhere("1")->getSQL(), "SELECT rowID FROM Groups WHERE 1");
+    EXPECT_STREQ(groups()->queryWhere("name=%Q", "1")->getSQL(),
+                 "SELECT rowID FROM Groups WHERE name='1'");
+    EXPECT_STREQ(groups()->allRows()->getSQL(), "SELECT * FROM Groups");
+    const Ref<ArrayOf<Group>> all = groups()->rowsWhere("name > '3' order by name")->allRows();
+    ASSERT_EQ(all->count(), 2U);
+    EXPECT_EQ(all->at(1)->mName.getValue()->utf8(), "5");
+    for (int i = 0; i < 6; ++i) {
+        saveItem(std::to_string(i).c_str());
+    }
+    EXPECT_STREQ(items()->rowsWhere("1")->getSQL(), "SELECT * FROM Items WHERE 1");
+}
+
+TEST_F(TableTest, ReplacesWhatARowHasByWhatACursorHas) {
+    const Ref<Item> item = Item::make("old");
+    item->saveChanges();
+    executeElsewhere("update Items set title='new', number=4");
+    item->mNumber.setValue(9);
+    const Ref<Item> found = items()->rowsWhere("1")->firstRow();
+    EXPECT_EQ(found.get(), item.get());
+    EXPECT_EQ(item->mTitle.getValue()->utf8(), "new");
+    EXPECT_EQ(item->mNumber.getValue(), 9);
+}
+
+TEST_F(TableTest, WalksTypedRows) {
+    saveItem("a");
+    saveItem("b");
+    std::string titles;
+    for (CursorOf<Item> cursor(items()->allRows()); cursor.hasRow(); cursor.nextRow()) {
+        titles += cursor.row()->mTitle.getValue()->utf8();
+    }
+    EXPECT_EQ(titles, "ab");
+    CursorOf<Item> none(items(), "select * from Items where title=%Q", "c");
+    EXPECT_EQ(Ref<Item>(none.row()).get(), nullptr);
+}
+
+TEST_F(TableTest, SavesNewRowsInOrderAndThenChangedOnesByID) {
+    const Ref<Item> a = Item::make("a");
+    const Ref<Item> b = Item::make("b");
+    a->saveChanges();
+    b->saveChanges();
+    b->mNumber.setValue(1);
+    const Ref<Item> d = Item::make("d");
+    d->addToTable(items());
+    const Ref<Item> c = Item::make("c");
+    c->addToTable(items());
+    a->mNumber.setValue(1);
+    const LoggingOn on({&gLogPersist});
+    LogCapture log;
+    items()->saveRows();
+    EXPECT_EQ(d->getRowID(), 3);
+    EXPECT_EQ(c->getRowID(), 4);
+    std::vector<std::string> updates;
+    for (const std::string& line : log.lines()) {
+        if (line.find("Updating") != std::string::npos) updates.push_back(line.substr(22, 8));
+    }
+    EXPECT_EQ(updates, (std::vector<std::string>{" Items[1", " Items[2"}));
+    EXPECT_TRUE(log.contains("[Persist] Table Items: Saving rows..."));
+    EXPECT_FALSE(items()->isChanged());
+}
+
+TEST_F(TableTest, SavesADroppedNewRow) {
+    {
+        const AutoreleasePool inner;
+        Item::make("a")->addToTable(items());
+    }
+    EXPECT_TRUE(items()->isChanged());
+    db().saveRows();
+    EXPECT_EQ(count("title='a'"), 1);
+    EXPECT_EQ(items()->getCachedRowCount(), 0U);
+}
+
+TEST_F(TableTest, StaysChangedWhenASaveFails) {
+    saveItem("same");
+    const LogCapture log;
+    const Ref<Item> item = Item::make("same");
+    item->addToTable(items());
+    EXPECT_THROW(db().saveRows(), Exception);
+    EXPECT_TRUE(items()->isChanged());
+    EXPECT_TRUE(item->isChanged());
+    EXPECT_FALSE(db().isInTransaction());
+    item->mTitle.setValue(text("other"));
+    db().saveRows();
+    EXPECT_EQ(item->getRowID(), 2);
+}
+
+TEST_F(TableTest, ForgetsAllRows) {
+    saveGroups(1, 1);
+    const Ref<Group> held = groups()->rowWithID(1);
+    const Ref<Group> fresh = Group::make("new");
+    fresh->addToTable(groups());
+    const LoggingOn on({&gLogPersist});
+    LogCapture log;
+    groups()->uncacheRows();
+    EXPECT_TRUE(log.contains("[Persist] Table Groups: Clearing row cache"));
+    EXPECT_FALSE(groups()->isChanged());
+    EXPECT_FALSE(held->isCached() || held->isRetained());
+    EXPECT_EQ(held->mName.getValue()->utf8(), "1");
+    EXPECT_NE(Ref<Group>(groups()->rowWithID(1)).get(), held.get());
+}
+
+TEST_F(TableTest, LetsRowsGoWhenTheDatabaseCloses) {
+    saveGroups(1, 6);
+    const Ref<Group> held = groups()->rowWithID(1);
+    db().close(true);
+    EXPECT_EQ(groups()->getCachedRowCount(), 0U);
+    EXPECT_FALSE(held->isRetained());
+    db().open(path.c_str(), true);
+    const Ref<Group> again = groups()->rowWithID(1);
+    EXPECT_NE(again.get(), held.get());
+    EXPECT_TRUE(again->isRetained());
+}
+
+TEST_F(TableTest, AForgottenObjectDoesNotTakeItsSuccessorAlong) {
+    const RowID rowID = saveItem("a");
+    Ref<Item> old = items()->rowWithID(rowID);
+    items()->uncacheRows();
+    const Ref<Item> now = items()->rowWithID(rowID);
+    old->mNumber.setValue(1);
+    old->saveChanges();
+    old = nullptr;
+    EXPECT_EQ(Ref<Item>(items()->rowWithID(rowID))->mTitle.getValue()->utf8(), "a");
+}
