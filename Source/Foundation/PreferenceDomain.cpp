@@ -69,19 +69,21 @@ void PreferenceDomain::reloadUnderLock(Content& content) {
 
 bool PreferenceDomain::writeChanges() {
     const PreferenceLock lock(mFile.getFolder());
-    if (lock.getError() != 0) return fail("saved", std::strerror(lock.getError()));
     Content content = mFile.read();
+    if (lock.getError() != 0) {
+        if (content.state != State::Failed) adopt(merged(content));
+        return fail("saved", std::strerror(lock.getError()));
+    }
     if (content.state == State::Damaged && !clearTheWay(content)) return false;
     if (content.state == State::Failed) return fail("read", content.reason);
 
-    const Ref<MutableDictionary> values = merged(content);
-    if (!values->isEqual(content.values.get())) {
-        const int error = mFile.write(*values);
+    adopt(merged(content));
+    if (!mValues->isEqual(content.values.get())) {
+        const int error = mFile.write(*mValues);
         if (error != 0) return fail("saved", std::strerror(error));
     }
     mChanges.clear();
     mFailureIsReported = false;
-    adopt(values);
     return true;
 }
 

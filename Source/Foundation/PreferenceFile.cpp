@@ -23,7 +23,11 @@ namespace {
 std::string homeFolder() {
     const char* home = std::getenv("HOME");
     if (home && *home == '/') return home;
-    const passwd* user = getpwuid(getuid());
+    // Not `getpwuid`: a log on another thread may get here.
+    passwd entry = {};
+    passwd* user = nullptr;
+    char texts[4096];
+    getpwuid_r(getuid(), &entry, texts, sizeof texts, &user);
     return user && user->pw_dir ? user->pw_dir : "/";
 }
 

@@ -25,7 +25,7 @@ template <class T>
 void callAfterDelay(double delay, T* target, void (T::*method)()) {
     auto timer = std::make_unique<RunOnceTimer<T>>(target, method);
     timer->start(delay, false);
-    timer.release();  // it owns itself from here on
+    static_cast<void>(timer.release());  // it owns itself from here on
 }
 
 }  // namespace Foundation

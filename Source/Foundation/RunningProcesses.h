@@ -16,7 +16,7 @@ struct RunningProcesses {
     /// The identifiers of the applications, with ASCII letters in lower case: for each process of
     /// this user the name of its executable file, the name that it runs under (which is a script's
     /// own where the file is that of its interpreter; the kernel cuts it at 15 bytes), and the
-    /// desktop file's. Takes some 30 µs for each process. `proc` is the kernel's folder of
+    /// desktop file's. Takes some 50 µs for each process. `proc` is the kernel's folder of
     /// processes.
     static std::set<std::string> getApplications(const std::string& proc = "/proc");
 };

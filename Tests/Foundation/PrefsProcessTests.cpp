@@ -89,6 +89,7 @@ TEST_F(PrefsProcess, UndoesNothingThatAnotherChangedMeanwhile) {
 TEST_F(PrefsProcess, ManyThatWriteAtATimeLoseNoChange) {
     constexpr int kProcesses = 4;
     std::vector<std::thread> writers;
+    writers.reserve(kProcesses);
     for (int i = 0; i < kProcesses; ++i) {
         writers.emplace_back([i] {
             runHelper({"count", kDomain, "Key" + std::to_string(i), "15"});

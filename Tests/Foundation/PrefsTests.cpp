@@ -258,6 +258,8 @@ TEST_F(PrefsTest, AHomeThatIsReadOnlyPutsTheChangesOff) {
     fs::permissions(folder.path(), kReadOnly);
     fs::permissions(folder.path(kDomain), fs::perms::all);
     set("A", "new");
+    std::ofstream(folder.path(kDomain))
+        << PreferenceFolder::xml(entry("A", "old") + entry("B", "theirs"));
     {
         const Support::OrdinaryFileAccess ordinary;
         prefs.synchronize();
@@ -266,6 +268,7 @@ TEST_F(PrefsTest, AHomeThatIsReadOnlyPutsTheChangesOff) {
     EXPECT_EQ(log.lines(), Lines({"[WARNING] The preferences in " + folder.path(kDomain) +
                                   " can't be saved: Permission denied"}));
     EXPECT_EQ(get("A"), "new");
+    EXPECT_EQ(get("B"), "theirs") << "what others write shows all the same";
     prefs.synchronize();
     EXPECT_EQ(readElsewhere("A"), "new");
 }
