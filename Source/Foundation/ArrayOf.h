@@ -17,7 +17,7 @@ namespace Foundation {
 template <class T>
 class ArrayOf : public Array {
  public:
-    /// Walks the elements. Ends to be valid when a `MutableArrayOf` is changed.
+    /// Walks the elements. Valid until a `MutableArrayOf` is changed.
     class Iterator {
      public:
         using iterator_category = std::forward_iterator_tag;
@@ -75,7 +75,7 @@ class ArrayOf : public Array {
     template <class Range>
     void append(const Range& elements) {
         for (const auto& element : elements) {
-            const T* pointer = &*element;
+            const T* pointer = element;
             mItems.emplace_back(pointer);
         }
     }

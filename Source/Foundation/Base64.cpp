@@ -14,8 +14,8 @@ constexpr std::uint8_t kOutside = 64;
 constexpr std::array<std::uint8_t, 256> makeValues() {
     std::array<std::uint8_t, 256> values{};
     values.fill(kOutside);
-    for (std::uint8_t i = 0; i < kAlphabet.size(); ++i) {
-        values[static_cast<unsigned char>(kAlphabet[i])] = i;
+    for (std::size_t i = 0; i < kAlphabet.size(); ++i) {
+        values[static_cast<unsigned char>(kAlphabet[i])] = static_cast<std::uint8_t>(i);
     }
     return values;
 }

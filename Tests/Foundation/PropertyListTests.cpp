@@ -19,7 +19,7 @@ using namespace Foundation;
 
 namespace {
 
-using Array_ = MutableArrayOf<PFRefCounted>;
+using List = MutableArrayOf<PFRefCounted>;
 
 std::string document(const std::string& value) {
     return "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n<plist version=\"1.0\">" + value +
@@ -77,7 +77,7 @@ TEST(PropertyList, WritesEveryKindOfValue) {
     tree->set("real", number(0.1));
     tree->set("data", Data::data("\0\1", 2));
     tree->set("date", Date::date(151546354.75));
-    tree->set("array", Array_::array({text("x"), Ref<Array_>(Array_::array()).detach()}));
+    tree->set("array", List::array({text("x"), static_cast<List*>(List::array())}));
     tree->set("dictionary", MutableDictionary::dictionary());
     EXPECT_EQ(xmlOf(tree), R"(<?xml version="1.0" encoding="UTF-8"?>
 <plist version="1.0">
@@ -133,7 +133,7 @@ TEST(PropertyList, KeepsTexts) {
 
 TEST(PropertyList, KeepsEmptyContainersAndOrder) {
     const AutoreleasePool pool;
-    expectKept(Ref<Array_>(Array_::array()).get());
+    expectKept(Ref<List>(List::array()).get());
     expectKept(Ref<Data>(Data::data(nullptr, 0)).get());
     const Ref<MutableDictionary> tree = MutableDictionary::dictionary();
     EXPECT_EQ(OVFormat("%@", throughXML(tree)), "{}");
@@ -149,7 +149,7 @@ TEST(PropertyList, GivesContainersThatCanBeChanged) {
     const Ref<PFRefCounted> value = PropertyList::read(Bytes(xml));
     auto* tree = dynamic_cast<MutableDictionary*>(value.get());
     ASSERT_NE(tree, nullptr);
-    auto* array = tree->getAs<Array_>("a");
+    auto* array = tree->getAs<List>("a");
     ASSERT_NE(array, nullptr);
     array->add(text("x"));
     EXPECT_EQ(OVFormat("%@", tree), "{a = (x)}");
@@ -286,7 +286,7 @@ TEST(PropertyList, LimitsTheDepth) {
 
 TEST(PropertyList, RefusesToWriteATreeWithoutEnd) {
     const AutoreleasePool pool;
-    const Ref<Array_> array = Array_::array();
+    const Ref<List> array = List::array();
     array->add(array);
     EXPECT_EQ(xmlOf(array), "error: too deep");
     array->removeAll();
@@ -311,7 +311,7 @@ TEST(PropertyList, RefusesToWriteOtherValues) {
     const Ref<Other> other = Returner<Other>(new Other);
     EXPECT_TRUE(xmlOf(other).ends_with("cannot be written")) << xmlOf(other);
     EXPECT_EQ(xmlOf(nullptr), "error: null cannot be written");
-    EXPECT_EQ(xmlOf(Ref<Array_>(Array_::array({nullptr})).get()), "error: null cannot be written");
+    EXPECT_EQ(xmlOf(Ref<List>(List::array({nullptr})).get()), "error: null cannot be written");
     using ByNumber = MutableDictionaryOf<Number, String>;
     EXPECT_EQ(xmlOf(Ref<ByNumber>(ByNumber::dictionary({{number(1), text("x")}})).get()),
               "error: the key 1 is no string");
