@@ -78,7 +78,9 @@ bool PreferenceDomain::writeChanges() {
     if (content.state == State::Failed) return fail("read", content.reason);
 
     adopt(merged(content));
-    if (!mValues->isEqual(content.values.get())) {
+    const bool isSame =
+        content.values ? mValues->isEqual(content.values.get()) : mValues->isEmpty();
+    if (!isSame) {
         const int error = mFile.write(*mValues);
         if (error != 0) return fail("saved", std::strerror(error));
     }

@@ -93,6 +93,9 @@ TEST_F(PrefsTest, SynchronizeWritesAtOnceAndStopsTheSaveToCome) {
 TEST_F(PrefsTest, WritesNothingIfNothingChanged) {
     prefs.synchronize();
     EXPECT_FALSE(std::filesystem::exists(folder.path()));
+    UntypedPref(prefs, "Key") = nullptr;
+    prefs.synchronize();
+    EXPECT_FALSE(folder.exists(kDomain));
     set("Key", "value");
     prefs.synchronize();
     const ino_t inode = folder.inodeOf(kDomain);
