@@ -9,7 +9,8 @@
 /// The library's log for applications. Lines go where the library's own lines go. Formats are
 /// those of `OVFormat.h`. Only `_OVAssertFailed` throws, and only if it is told to. Main thread.
 
-/// What the functions below are made of, for formats that are known only at run time.
+/// What the functions below are made of, for formats that are known only at run time. A null format
+/// is none: the first two write nothing for it.
 OV_EXPORT void _OVLogV(const char* format, std::span<const OVFormatArgument> arguments);
 OV_EXPORT void AlwaysWarnV(const char* format, std::span<const OVFormatArgument> arguments);
 OV_EXPORT void _OVAssertFailedV(const char* function, bool shouldRaise, OVFormatArgument self,

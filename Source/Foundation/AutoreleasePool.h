@@ -62,11 +62,12 @@ class AutoreleasePool : Uncopyable {
     /// has no pool this warns, with the call stack, and gives false: there is no entry then.
     static bool add(const RefCounted* object);
 
+    /// Whether a pool of the calling thread is open: then no other thread can open one.
+    static bool currentThreadHasPool();
     /// How many pools are open.
     static std::uint32_t getNestLevel() { return sAutoreleasePoolNestLevel; }
 
  private:
-    static bool currentThreadHasPool();
     static void warnNoPool(const RefCounted* object);
     static void warnNoPool(const PFRefCounted* object);
     template <class T>

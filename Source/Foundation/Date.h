@@ -6,6 +6,7 @@
 namespace Foundation {
 
 class Date;
+class DateFormatter;
 using DateReturner = Returner<Date>;
 
 /// A point in time: seconds since 2001-01-01 00:00:00 GMT. Immutable. That start itself is not a
@@ -20,6 +21,24 @@ class Date : public PFRefCounted {
     static DateReturner nowPlus(double seconds);
     /// `seconds` after this date; null if that is the start of the count.
     DateReturner addTime(double seconds) const;
+
+    /// The date that a text says, see `parseDateText`, whatever zone it is in. Null, with a
+    /// warning, if it says none.
+    static DateReturner parseDate(const String* text);
+
+    /// The text by a formatter; null for none. The zone of `getAtomFormat` gets its colon here,
+    /// which no pattern of ICU's can give it in all cases.
+    StringReturner toStringUsingFormat(DateFormatter* formatter) const;
+    /// "2005-10-21T00:12:34.000+0000", in the default time zone.
+    static DateFormatter* getAtomFormat();
+    /// "Fri, 21 Oct 2005 24:12:34 GMT": hours count from 1 to 24.
+    static DateFormatter* getHTTPFormat();
+    /// The short date and the long time in the current locale; null for null.
+    static StringReturner dateToString(const Date* date);
+    /// A text for people, which says no more of the day than is needed: the nearer, the shorter.
+    /// The days before today count within the year only, so that on 1 January the day before is
+    /// one of another year. A day to come is one of this year or another.
+    StringReturner getLocalizedRelativeString() const;
 
     /// Seconds from the date to now, negative for one to come. Null counts as 0.0, the start of the
     /// count.

@@ -1,26 +1,12 @@
 #include "Foundation/ErrorTexts.h"
 
+#include "Foundation/Bundle.h"
+
 #include <Orvane/OVErrorCode.h>
 
 namespace Foundation {
 
 namespace {
-
-struct KeyedText {
-    std::string_view key;
-    const char* text;
-};
-
-constexpr KeyedText kTexts[] = {
-    {"OVInternalErrorDescription", "The feed could not be read."},
-    {"OVInternalErrorFailureReason", "Something unexpected went wrong inside the feed service."},
-    {"OVInternalErrorRecoverySuggestion", "Try again later."},
-    {"OVNotAFeedErrorDescription", "This is not a feed."},
-    {"OVNotAFeedErrorFailureReason", "What the server sent is neither RSS, RDF nor Atom."},
-    {"OVNotAFeedErrorRecoverySuggestion", "Look for a link to a feed on the site's pages."},
-    {"PNURLErrorUserAuthenticationRequired Description",
-     "The server wants a user name and a password."},
-};
 
 struct URLErrorText {
     int code;
@@ -51,16 +37,9 @@ constexpr URLErrorText kURLErrorTexts[] = {
 
 }  // namespace
 
-std::string localizedErrorText(std::string_view key) {
-    for (const KeyedText& entry : kTexts) {
-        if (entry.key == key) return entry.text;
-    }
-    return std::string(key);
-}
-
 std::string describeURLError(int code) {
     for (const URLErrorText& entry : kURLErrorTexts) {
-        if (entry.code == code) return entry.text;
+        if (entry.code == code) return localizedText(entry.text);
     }
     return {};
 }

@@ -22,15 +22,15 @@ struct NetError {
     static constexpr std::int64_t kMach = 11;     ///< a status of the message transport
     static constexpr std::int64_t kNetDB = 12;    ///< an `EAI_` code of the resolver
     static constexpr std::int64_t kPFURL = 15;    ///< a code of URL loading, or of a file URL
-    static constexpr std::int64_t kFTP = 1201;    ///< an FTP reply code
+    static constexpr std::int64_t kPFMessagePort = 1001;
+    static constexpr std::int64_t kOrvane = 1002;  ///< an `OVErrorCode`
+    static constexpr std::int64_t kFTP = 1201;     ///< an FTP reply code
     static constexpr std::int64_t kNetServices = 1202;
     static constexpr std::int64_t kSSL = 1203;
     static constexpr std::int64_t kSOCKS = 1204;
     static constexpr std::int64_t kSystemConfig = 1205;
     static constexpr std::int64_t kHTTP = 1206;  ///< an HTTP status, or below 0 a failed exchange
-    static constexpr std::int64_t kPFMessagePort = 1001;
-    static constexpr std::int64_t kOrvane = 1002;  ///< an `OVErrorCode`
-    static constexpr std::int64_t kCustom = -1;    ///< none of these; code -1 is an unknown error
+    static constexpr std::int64_t kCustom = -1;  ///< none of these; code -1 is an unknown error
 
     std::int64_t domain = 0;
     std::int32_t code = 0;
@@ -79,7 +79,8 @@ struct NetError {
 
 inline constexpr NetError NetError::None{};
 
-/// Codes of the domain `kMach`. The numbers are what a client's status words have always held.
+/// Codes of the domain `kMach`: what the transport of calls to the agent reports. Programs of other
+/// versions read them too, so the numbers stay.
 namespace MachError {
 inline constexpr std::int32_t kInvalidDestination = 0x10000003;
 inline constexpr std::int32_t kSendTimedOut = 0x10000004;

@@ -29,7 +29,7 @@ std::string tryToFormat(const char* format, std::span<const OVFormatArgument> ar
 std::string assertionMessage(const char* function, const OVFormatArgument& self, const char* format,
                              std::span<const OVFormatArgument> arguments) {
     std::string message =
-        *format ? tryToFormat(format, arguments) : OVFormat(" %s ...NOT!!", function);
+        format && *format ? tryToFormat(format, arguments) : OVFormat(" %s ...NOT!!", function);
     if (self.pointer()) message += tryToFormat(" (self = %@)", {&self, 1});
     return message;
 }
@@ -45,10 +45,12 @@ bool WillLog(const char* name) {
 // Lines are the general log's, which puts no name before the text.
 
 void _OVLogV(const char* format, std::span<const OVFormatArgument> arguments) {
+    if (!format) return;
     if (WillLog(facilityOf(format).c_str())) Foundation::gLog.alwaysLogV(format, arguments);
 }
 
 void AlwaysWarnV(const char* format, std::span<const OVFormatArgument> arguments) {
+    if (!format) return;
     Foundation::gLog.alwaysLogV(("WARNING: " + std::string(format)).c_str(), arguments);
 }
 

@@ -1,5 +1,6 @@
 #include "Foundation/PublicErrors.h"
 
+#include "Foundation/Bundle.h"
 #include "Foundation/ErrorTexts.h"
 #include "Foundation/Logger.h"
 #include "Foundation/PublicErrorMap.h"
@@ -17,7 +18,7 @@ OVError errorOfURL(int code, std::string_view url) {
     std::string description = describeURLError(code);
     if (description.empty() && (code == OVURLErrorUserAuthenticationRequired ||
                                 code == OVURLErrorUserCancelledAuthentication)) {
-        description = localizedErrorText("PNURLErrorUserAuthenticationRequired Description");
+        description = localizedText("PNURLErrorUserAuthenticationRequired Description");
     }
     error.setDescription(std::move(description));
     error.setURL(std::string(url));
@@ -49,9 +50,9 @@ OVError errorWithCode(int code, std::string_view url) {
     error.setURL(std::string(url));
     if (const char* name = keyOf(code)) {
         const std::string key = name;
-        error.setDescription(localizedErrorText(key + "Description"));
-        error.setFailureReason(localizedErrorText(key + "FailureReason"));
-        error.setRecoverySuggestion(localizedErrorText(key + "RecoverySuggestion"));
+        error.setDescription(localizedText(key + "Description"));
+        error.setFailureReason(localizedText(key + "FailureReason"));
+        error.setRecoverySuggestion(localizedText(key + "RecoverySuggestion"));
     }
     return error;
 }

@@ -1,6 +1,7 @@
 #include "Foundation/TimeZone.h"
 
-#include "Foundation/Clock.h"
+#include "Foundation/Data.h"
+#include "Foundation/ICUTime.h"
 #include "Foundation/Ref.h"
 #include "Foundation/String.h"
 #include "Foundation/TimeZoneNames.h"
@@ -9,7 +10,6 @@
 #include <unicode/timezone.h>
 
 #include <algorithm>
-#include <cmath>
 #include <functional>
 #include <iterator>
 #include <map>
@@ -20,18 +20,6 @@ namespace {
 
 // The length of the longest identifier of the zone database is below half of this.
 constexpr std::size_t kMaxNameLength = 64;
-constexpr double kMillisecondsPerSecond = 1000;
-// ICU counts from 1970 and keeps its days in 32 bits: times this far out are the last ones for
-// which it does not overflow.
-constexpr double kMaxICUTime = 8.64e15;
-
-/// ICU's time for one of the system's; what ICU cannot take is moved to the nearest it can.
-UDate toICU(double time) {
-    if (std::isnan(time)) time = 0;
-    // Whole seconds: a fraction makes no difference to a zone's rules.
-    const double milliseconds = (std::floor(time) + kUnixEpochOffset) * kMillisecondsPerSecond;
-    return std::clamp(milliseconds, -kMaxICUTime, kMaxICUTime);
-}
 
 std::string idOf(const icu::TimeZone& zone) {
     icu::UnicodeString id;
@@ -66,7 +54,7 @@ std::int32_t TimeZone::Rules::secondsAt(double absoluteTime) const {
     std::int32_t raw = 0;
     std::int32_t daylight = 0;
     UErrorCode status = U_ZERO_ERROR;
-    zone->getOffset(toICU(absoluteTime), false, raw, daylight, status);
+    zone->getOffset(toICUTime(absoluteTime), false, raw, daylight, status);
     return U_SUCCESS(status) ? (raw + daylight) / 1000 : 0;
 }
 
@@ -76,7 +64,7 @@ std::int32_t TimeZone::Rules::secondsAtLocal(double localTime) const {
     UErrorCode status = U_ZERO_ERROR;
     // Every zone that ICU makes is a basic one.
     static_cast<const icu::BasicTimeZone&>(*zone).getOffsetFromLocal(
-        toICU(localTime), UCAL_TZ_LOCAL_FORMER, UCAL_TZ_LOCAL_FORMER, raw, daylight, status);
+        toICUTime(localTime), UCAL_TZ_LOCAL_FORMER, UCAL_TZ_LOCAL_FORMER, raw, daylight, status);
     return U_SUCCESS(status) ? (raw + daylight) / 1000 : 0;
 }
 
@@ -103,6 +91,17 @@ TimeZoneReturner TimeZone::timeZone(std::string_view name) {
 
 TimeZoneReturner TimeZone::timeZone(const String* name) {
     return name ? timeZone(name->view()) : nullptr;
+}
+
+TimeZoneReturner TimeZone::timeZoneWithData(const Data* data) {
+    if (!data) return nullptr;
+    // No abbreviations: a default zone may be called "CET" and have that place's rules.
+    if (const auto offset = readGMTOffset(data->view())) return fixedZone(*offset);
+    return place(data->view());
+}
+
+DataReturner TimeZone::getData() const {
+    return Data::adopt(mName);
 }
 
 TimeZoneReturner TimeZone::place(std::string_view name) {

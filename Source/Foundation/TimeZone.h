@@ -26,6 +26,9 @@ class TimeZone : public PFRefCounted {
     /// ("GMT+01:00") or a place of the zone database ("Europe/Berlin"). Null if nobody knows it.
     static TimeZoneReturner timeZone(std::string_view name);
     static TimeZoneReturner timeZone(const String* name);
+    /// The zone that `getData` made the data of; null for null, and if it is not one of this
+    /// machine.
+    static TimeZoneReturner timeZoneWithData(const Data* data);
     /// The zone that is always `secondsFromGMT` ahead of GMT.
     static TimeZoneReturner fixedZone(std::int32_t secondsFromGMT);
 
@@ -38,6 +41,8 @@ class TimeZone : public PFRefCounted {
 
     /// The zone's name, which `timeZone` understands.
     const std::string& getName() const { return mName; }
+    /// The name's bytes, for stores.
+    DataReturner getData() const;
     /// How far the zone is ahead of GMT at a time, in seconds.
     std::int32_t getSecondsFromGMT(double absoluteTime) const;
     /// The absolute time at which clocks in the zone show `localTime`, which counts seconds from

@@ -27,8 +27,15 @@
 
 using namespace Foundation;
 
-// Functions that the stack is to show have names that it can see.
-#define SHOWN extern "C" __attribute__((noinline, visibility("default")))
+// Functions that the stack is to show: each has a name that it can see and a frame of its own.
+#ifdef __clang__
+#define SHOWN extern "C" __attribute__((noinline, optnone, visibility("default")))
+#else
+// Nor may a part of it stand apart under another name.
+#define SHOWN  \
+    extern "C" \
+        __attribute__((noipa, visibility("default"), optimize("no-reorder-blocks-and-partition")))
+#endif
 
 SHOWN void functionThatFails() {
     OV_ASSERT_AS(false, "x > 0");
@@ -40,7 +47,7 @@ SHOWN void functionThatFailsWithAMessage(int number) {
 
 SHOWN void functionThatPrints(int skip, int count) {
     Compatibility::Utils::printStack(skip, count);
-    std::fputs("end\n", stderr);  // so that the call above is none that ends the function
+    std::fputs("end\n", stderr);  // so that the call above does not end the function
 }
 
 SHOWN void functionThatGoesDeeper(int depth, int skip, int count) {
@@ -49,7 +56,7 @@ SHOWN void functionThatGoesDeeper(int depth, int skip, int count) {
     } else {
         functionThatGoesDeeper(depth - 1, skip, count);
     }
-    std::fputs("", stderr);
+    std::fflush(stderr);  // the same
 }
 
 namespace {

@@ -88,6 +88,21 @@ TEST(OVLog, AlwaysWarns) {
     EXPECT_EQ(log.lines(), Lines({"WARNING: answer is 42", "WARNING: [Feed] text"}));
 }
 
+TEST(OVLog, TakesFormatsThatAreKnownOnlyAtRunTime) {
+    const LogCapture log;
+    const EnvVar all("OVLog", "1");
+    const OVFormatArgument number[] = {42};
+    _OVLogV("%d %s", number);
+    AlwaysWarnV("%d", number);
+    _OVLogV(nullptr, number);
+    AlwaysWarnV(nullptr, number);
+    testing::internal::CaptureStderr();
+    _OVAssertFailedV(kFunction, false, {nullptr, nullptr}, nullptr, {});
+    EXPECT_EQ(testing::internal::GetCapturedStderr(), kContinuing);
+    EXPECT_EQ(log.lines(),
+              Lines({"42 %s", "WARNING: 42", "WARNING: ASSERTION FAILED:  int f(int) ...NOT!!"}));
+}
+
 TEST(OVLog, FormatsNothingTwice) {
     const LogCapture log;
     AlwaysWarn("%s", "100%s");

@@ -1,5 +1,6 @@
 #include "Foundation/PublicErrors.h"
 
+#include "Foundation/Bundle.h"
 #include "Foundation/ErrorTexts.h"
 #include "Foundation/Logger.h"
 #include "Foundation/NetException.h"
@@ -38,9 +39,9 @@ TEST(PublicErrors, ExplainAnInternalErrorAndWhatIsNoFeed) {
         const std::string key = code == OVInternalError ? "OVInternalError" : "OVNotAFeedError";
         EXPECT_EQ(error.domain(), OVErrorDomain);
         EXPECT_EQ(error.code(), code);
-        EXPECT_EQ(error.description(), localizedErrorText(key + "Description"));
-        EXPECT_EQ(error.failureReason(), localizedErrorText(key + "FailureReason"));
-        EXPECT_EQ(error.recoverySuggestion(), localizedErrorText(key + "RecoverySuggestion"));
+        EXPECT_EQ(error.description(), localizedText(key + "Description"));
+        EXPECT_EQ(error.failureReason(), localizedText(key + "FailureReason"));
+        EXPECT_EQ(error.recoverySuggestion(), localizedText(key + "RecoverySuggestion"));
         EXPECT_EQ(error.URL(), kURL);
     }
 }
@@ -49,12 +50,12 @@ TEST(PublicErrors, HaveATextForEachOfTheirKeys) {
     std::set<std::string> texts;
     for (const std::string name : {"OVInternalError", "OVNotAFeedError"}) {
         for (const char* part : {"Description", "FailureReason", "RecoverySuggestion"}) {
-            EXPECT_NE(localizedErrorText(name + part), name + part);
-            texts.insert(localizedErrorText(name + part));
+            EXPECT_NE(localizedText(name + part), name + part);
+            texts.insert(localizedText(name + part));
         }
     }
     EXPECT_EQ(texts.size(), 6u);
-    EXPECT_EQ(localizedErrorText("no such key"), "no such key");
+    EXPECT_EQ(localizedText("no such key"), "no such key");
 }
 
 TEST(PublicErrors, DoNotExplainOtherCodesOfTheLibrary) {
@@ -96,7 +97,7 @@ TEST(PublicErrors, DescribeEveryURLCodeThatErrorsBecome) {
 }
 
 TEST(PublicErrors, SpeakOfAPasswordWhereTheServerWantsOne) {
-    const std::string text = localizedErrorText("PNURLErrorUserAuthenticationRequired Description");
+    const std::string text = localizedText("PNURLErrorUserAuthenticationRequired Description");
     EXPECT_EQ(errorWithNetError({NetError::kHTTP, 401}, kURL).description(), text);
     EXPECT_EQ(errorWithNetError({NetError::kPFURL, -1013}, kURL).description(), text);
     EXPECT_EQ(errorWithNetError({NetError::kPFURL, -1012}, kURL).description(), text);

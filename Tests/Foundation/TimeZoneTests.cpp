@@ -1,6 +1,7 @@
 #include "Foundation/TimeZone.h"
 
 #include "Foundation/AutoreleasePool.h"
+#include "Foundation/Data.h"
 #include "Foundation/Date.h"
 #include "Foundation/FormatObjects.h"
 #include "Foundation/GregorianDate.h"
@@ -11,6 +12,7 @@
 #include <gtest/gtest.h>
 
 #include <cmath>
+#include <cstring>
 #include <limits>
 #include <tuple>
 
@@ -98,7 +100,8 @@ TEST(TimeZone, OfAnUnknownNameIsNull) {
         EXPECT_EQ(zone(name).get(), nullptr) << name;
     }
     EXPECT_EQ(zone(std::string_view("GMT\0", 4)).get(), nullptr);
-    EXPECT_EQ(Ref<TimeZone>(TimeZone::timeZone(nullptr)).get(), nullptr);
+    EXPECT_EQ(Ref<TimeZone>(TimeZone::timeZone(static_cast<const String*>(nullptr))).get(),
+              nullptr);
 }
 
 TEST(TimeZone, TakesItsNameAsAString) {
@@ -122,6 +125,27 @@ TEST(TimeZone, HasANameThatIsReadBack) {
     EXPECT_EQ(Ref<TimeZone>(TimeZone::fixedZone(-16200))->getName(), "GMT-04:30");
     EXPECT_EQ(Ref<TimeZone>(TimeZone::fixedZone(1))->getName(), "GMT+00:00:01");
     EXPECT_EQ(zone("EST")->getName(), "GMT-05:00");
+}
+
+TEST(TimeZone, IsReadBackFromItsData) {
+    for (const char* name : {"Europe/Berlin", "GMT", "EST", "GMT-04:30", "EST5EDT"}) {
+        const Ref<TimeZone> original = zone(name);
+        const Ref<Data> data = original->getData();
+        const Ref<TimeZone> again = TimeZone::timeZoneWithData(data);
+        EXPECT_TRUE(IsEqual(original.get(), again.get())) << name;
+    }
+    const DefaultZone cet("CET");
+    const Ref<Data> data = TimeZone::defaultZone()->getData();
+    EXPECT_EQ(data->view(), "CET");
+    EXPECT_EQ(Ref<TimeZone>(TimeZone::timeZoneWithData(data))->getSecondsFromGMT(kSummer), 7200);
+}
+
+TEST(TimeZone, OfDataThatIsNoneIsNull) {
+    EXPECT_EQ(Ref<TimeZone>(TimeZone::timeZoneWithData(nullptr)).get(), nullptr);
+    for (const char* bytes : {"", "Mars/Olympus", "EST ", "\xff"}) {
+        const Ref<Data> data = Data::data(bytes, std::strlen(bytes));
+        EXPECT_EQ(Ref<TimeZone>(TimeZone::timeZoneWithData(data)).get(), nullptr) << bytes;
+    }
 }
 
 TEST(TimeZone, EqualsByName) {

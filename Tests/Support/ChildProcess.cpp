@@ -41,6 +41,7 @@ std::string readTerminal(int fd) {
 
 pid_t spawn(const std::vector<std::string>& command, int out, int err) {
     std::vector<char*> arguments;
+    arguments.reserve(command.size() + 1);
     for (const std::string& word : command) {
         arguments.push_back(const_cast<char*>(word.c_str()));
     }
