@@ -1,5 +1,6 @@
 #include "Foundation/RunLoop.h"
 
+#include "Foundation/AssertionFailure.h"
 #include "Foundation/Clock.h"
 #include "Foundation/Guard.h"
 #include "Foundation/RunLoopMode.h"
@@ -91,7 +92,7 @@ RunLoop::Result RunLoop::runInMode(const std::string& name, double seconds,
     Mode& mode = modeNamed(name);
     const double deadline = Clock::current().now() + seconds;
     const std::size_t depth = mRuns.size();
-    mRuns.push_back({.deadline = deadline});
+    mRuns.push_back({.deadline = deadline, .depth = g_main_depth()});
     bool mayWait = true;
     // The run's entry is looked up each time: nested runs may move it.
     while (mayWait && !mRuns[depth].stopped &&
@@ -117,9 +118,16 @@ bool RunLoop::turn(const std::string& mode) {
     return any;
 }
 
-void RunLoop::noteHandled(const RunLoopSource* source) {
+void RunLoop::serve(RunLoopSource* source, short events) {
     const bool isInternal = source == mPerform.get();
     if (!isInternal && !mRuns.empty()) mRuns.back().handledSource = true;
+    mServing.push_back(source);
+    callGuarded("void Foundation::RunLoopSource::ready(short)", [&] { source->ready(events); });
+    mServing.pop_back();
+}
+
+bool RunLoop::isServing(const RunLoopSource* source) const {
+    return std::find(mServing.begin(), mServing.end(), source) != mServing.end();
 }
 
 void RunLoop::wakeUp() {
@@ -131,16 +139,16 @@ void RunLoop::perform(std::function<void()> function) {
 }
 
 RunLoop::Mode& RunLoop::modeNamed(const std::string& name) {
-    std::unique_ptr<Mode>& mode = mModes[name];
-    if (!mode) {
-        GMainContext* context = g_main_context_new();
-        mode = std::make_unique<Mode>(*this, name, context);
-        g_main_context_unref(context);
-        for (RunLoopSource* source : mSources) {
-            if (source->mMode == kCommonModes) mode->attach(source);
-        }
+    const auto found = mModes.find(name);
+    if (found != mModes.end()) return *found->second;
+    OV_ASSERT(name != kCommonModes);
+    const std::unique_ptr<GMainContext, void (*)(GMainContext*)> context(g_main_context_new(),
+                                                                         g_main_context_unref);
+    Mode& mode = *(mModes[name] = std::make_unique<Mode>(*this, name, context.get()));
+    for (RunLoopSource* source : mSources) {
+        if (source->mMode == kCommonModes) mode.attach(source);
     }
-    return *mode;
+    return mode;
 }
 
 void RunLoop::addSource(RunLoopSource* source) {
@@ -156,6 +164,9 @@ void RunLoop::addSource(RunLoopSource* source) {
 
 void RunLoop::removeSource(RunLoopSource* source) {
     mSources.erase(source);
+    // Another source may come to stand at its address.
+    std::replace(mServing.begin(), mServing.end(), static_cast<const RunLoopSource*>(source),
+                 static_cast<const RunLoopSource*>(nullptr));
     for (auto& [name, mode] : mModes) {
         mode->detach(source);
     }
@@ -192,7 +203,10 @@ double RunLoop::getNextFireDate(const std::string& mode) {
 
 double RunLoop::getNextWakeDate(const std::string& mode) {
     const double next = getNextFireDate(mode);
-    return mRuns.empty() ? next : std::min(next, mRuns.back().deadline);
+    // A loop of somebody else's inside a callback of the run must not wake for the deadline: it
+    // cannot end the run, and would wake for ever once the deadline has passed.
+    const bool isOwnTurn = !mRuns.empty() && mRuns.back().depth == g_main_depth();
+    return isOwnTurn ? std::min(next, mRuns.back().deadline) : next;
 }
 
 void RunLoop::fireDueTimers(const std::string& mode) {

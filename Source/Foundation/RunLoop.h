@@ -42,15 +42,15 @@ class RunLoop : Uncopyable {
     /// (infinity for no limit; 0 serves what is ready and returns) or, if
     /// `returnAfterSourceHandled`, until a source, not a timer, has been served. Runs may nest.
     Result runInMode(const std::string& mode, double seconds, bool returnAfterSourceHandled);
-    /// Ends the innermost run at the end of its turn.
+    /// Ends the innermost run at the end of its turn; does nothing outside of a run.
     void stop();
     /// Serves everything that is ready now, without waiting. Whether there was anything.
     bool turn(const std::string& mode = kDefaultMode);
 
     /// Makes a waiting run look again. Any thread.
     void wakeUp();
-    /// Calls `function` in a later turn of this loop, in any mode, in the order of the calls. Any
-    /// thread.
+    /// Calls `function` in a later turn of this loop, in any mode, in the order of the calls. A run
+    /// inside such a function serves those behind it. Any thread.
     void perform(std::function<void()> function);
 
     /// Serves the timer in `mode`, or in all modes. REQUIRES: the timer is valid, in no loop.
@@ -70,6 +70,7 @@ class RunLoop : Uncopyable {
     /// A run that has begun and not returned.
     struct Run {
         double deadline;
+        int depth;  ///< of GLib's dispatches around the run
         bool stopped = false;
         bool handledSource = false;
     };
@@ -80,7 +81,8 @@ class RunLoop : Uncopyable {
 
     Mode& modeNamed(const std::string& name);
     void addSource(RunLoopSource* source);
-    void noteHandled(const RunLoopSource* source);
+    void serve(RunLoopSource* source, short events);
+    bool isServing(const RunLoopSource* source) const;
     void removeSource(RunLoopSource* source);
     void removeTimer(RunLoopTimer* timer);
 
@@ -95,7 +97,8 @@ class RunLoop : Uncopyable {
     std::map<const RunLoopTimer*, std::string> mModeOfTimer;
     std::set<RunLoopSource*> mSources;
     std::unique_ptr<PerformSource> mPerform;
-    std::vector<Run> mRuns;  ///< the nested runs, innermost last
+    std::vector<Run> mRuns;                      ///< the nested runs, innermost last
+    std::vector<const RunLoopSource*> mServing;  ///< those in their `ready`, innermost last
     std::uint64_t mNextSequence = 1;
 };
 

@@ -1,13 +1,15 @@
 #include "Foundation/RunLoopMode.h"
 
+#include "Foundation/AssertionFailure.h"
 #include "Foundation/Clock.h"
-#include "Foundation/Guard.h"
 
 #include <sys/timerfd.h>
 #include <unistd.h>
 
 #include <algorithm>
+#include <cerrno>
 #include <cmath>
+#include <cstring>
 #include <ctime>
 #include <limits>
 
@@ -18,11 +20,14 @@ namespace {
 constexpr double kNever = std::numeric_limits<double>::infinity();
 
 std::timespec timespecOf(double date) {
-    const double unixTime = date + kUnixEpochOffset;
+    // What has passed is as good as 2001. Whole seconds are taken apart first, as the sum of the
+    // date and the offset would lose its last bits.
+    const double reached = std::fmax(date, 0);
+    const double seconds = std::floor(reached);
     std::timespec t = {};
-    t.tv_sec = static_cast<std::time_t>(unixTime);
+    t.tv_sec = static_cast<std::time_t>(seconds) + static_cast<std::time_t>(kUnixEpochOffset);
     // Rounded up: a timer that wakes a moment early would have to wait once more.
-    t.tv_nsec = static_cast<long>(std::ceil((unixTime - std::floor(unixTime)) * 1e9));
+    t.tv_nsec = static_cast<long>(std::ceil((reached - seconds) * 1e9));
     if (t.tv_nsec > 999'999'999) {
         t.tv_nsec = 0;
         ++t.tv_sec;
@@ -52,12 +57,16 @@ GSourceFuncs RunLoop::Mode::sSourceFunctions = {prepareSource, checkSource, disp
                                                 nullptr,       nullptr,     nullptr};
 
 RunLoop::Mode::Mode(RunLoop& loop, const std::string& name, GMainContext* context)
-    : mLoop(loop), mName(name), mContext(g_main_context_ref(context)), mArmedFor(kNever) {
-    mTimerFD = timerfd_create(CLOCK_REALTIME, TFD_NONBLOCK | TFD_CLOEXEC);
+    : mLoop(loop),
+      mName(name),
+      mTimerFD(timerfd_create(CLOCK_REALTIME, TFD_NONBLOCK | TFD_CLOEXEC)),
+      mArmedFor(kNever) {
+    OV_ASSERT_MESSAGE(mTimerFD, "A run loop gets no timer: %s", std::strerror(errno));
+    mContext = g_main_context_ref(context);
     mTimerSource = g_source_new(&sTimerFunctions, sizeof(TimerGSource));
     auto* timers = reinterpret_cast<TimerGSource*>(mTimerSource);
     timers->mode = this;
-    timers->fdTag = g_source_add_unix_fd(mTimerSource, mTimerFD, G_IO_IN);
+    timers->fdTag = g_source_add_unix_fd(mTimerSource, mTimerFD.get(), G_IO_IN);
     // A timer's callback may run the loop again, and other timers must fire in that run.
     g_source_set_can_recurse(mTimerSource, TRUE);
     g_source_set_name(mTimerSource, "Orvane timers");
@@ -71,7 +80,6 @@ RunLoop::Mode::~Mode() {
     g_source_destroy(mTimerSource);
     g_source_unref(mTimerSource);
     g_main_context_unref(mContext);
-    if (mTimerFD >= 0) close(mTimerFD);
 }
 
 void RunLoop::Mode::attach(RunLoopSource* source) {
@@ -118,7 +126,7 @@ void RunLoop::Mode::armTimer(double date) {
     itimerspec setting = {};
     constexpr double kFarAway = 1e12;  // beyond what the kernel's seconds are good for
     if (date < kFarAway) setting.it_value = timespecOf(date);
-    timerfd_settime(mTimerFD, TFD_TIMER_ABSTIME | TFD_TIMER_CANCEL_ON_SET, &setting, nullptr);
+    timerfd_settime(mTimerFD.get(), TFD_TIMER_ABSTIME | TFD_TIMER_CANCEL_ON_SET, &setting, nullptr);
 }
 
 gboolean RunLoop::Mode::prepareTimers(GSource* source, gint* timeout) {
@@ -136,7 +144,7 @@ gboolean RunLoop::Mode::checkTimers(GSource* source) {
         std::uint64_t expirations;
         // Fails with ECANCELED when the clock was set: then, too, the dates are looked at anew.
         [[maybe_unused]] const ssize_t ignored =
-            read(mode.mTimerFD, &expirations, sizeof expirations);
+            read(mode.mTimerFD.get(), &expirations, sizeof expirations);
         mode.mArmedFor = kNever;
     }
     return mode.timersAreDue();
@@ -162,7 +170,10 @@ void RunLoop::Mode::watch(SourceGSource* entry, const RunLoopSource::Interest& w
 
 gboolean RunLoop::Mode::prepareSource(GSource* source, gint* timeout) {
     auto* entry = reinterpret_cast<SourceGSource*>(source);
-    watch(entry, entry->source->interest());
+    // In another mode the source has an entry of its own, which GLib does not hold back.
+    RunLoopSource* const runSource = entry->source;
+    const bool isHeldBack = entry->mode->mLoop.isServing(runSource) && !runSource->isReentrant();
+    watch(entry, isHeldBack ? RunLoopSource::Interest{} : runSource->interest());
     *timeout = -1;
     if (entry->interest.deadline >= 0) {
         const gint64 left = entry->interest.deadline - g_source_get_time(source);
@@ -183,9 +194,7 @@ gboolean RunLoop::Mode::dispatchSource(GSource* source, GSourceFunc, gpointer) {
     auto* entry = reinterpret_cast<SourceGSource*>(source);
     const GIOCondition events =
         entry->fdTag ? g_source_query_unix_fd(source, entry->fdTag) : GIOCondition{};
-    entry->mode->mLoop.noteHandled(entry->source);
-    callGuarded("void Foundation::RunLoopSource::ready(short)",
-                [&] { entry->source->ready(static_cast<short>(events)); });
+    entry->mode->mLoop.serve(entry->source, static_cast<short>(events));
     return G_SOURCE_CONTINUE;
 }
 

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "Foundation/RunLoop.h"
+#include "Foundation/UniqueFD.h"
 
 #include <glib.h>
 
@@ -42,9 +43,9 @@ class RunLoop::Mode : Uncopyable {
 
     RunLoop& mLoop;
     std::string mName;
-    GMainContext* mContext;
+    UniqueFD mTimerFD;  ///< an absolute wall-clock timer, so that a sleep or a set clock wakes us
+    GMainContext* mContext = nullptr;
     GSource* mTimerSource = nullptr;
-    int mTimerFD = -1;  ///< an absolute wall-clock timer, so that a sleep or a set clock wakes us
     double mArmedFor;
     std::map<RunLoopSource*, GSource*> mSources;
 };

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "Foundation/RunLoop.h"
+#include "Foundation/UniqueFD.h"
 
 #include <deque>
 #include <functional>
@@ -20,8 +21,12 @@ class RunLoop::PerformSource : public RunLoopSource {
  private:
     Interest interest() noexcept override;
     void ready(short events) override;
+    bool isReentrant() const noexcept override { return true; }
 
-    int mEventFD;
+    std::size_t countQueued();
+    std::function<void()> takeFirst();
+
+    UniqueFD mEventFD;
     std::mutex mMutex;
     std::deque<std::function<void()>> mQueue;  ///< guarded by mMutex
 };

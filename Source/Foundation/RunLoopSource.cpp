@@ -32,16 +32,12 @@ RunLoopSource::Interest FileDescriptorSource::interest() noexcept {
 
 void FileDescriptorSource::ready(short events) {
     constexpr short kFailed = POLLERR | POLLHUP | POLLNVAL;
-    // Either handler may replace the handlers or destroy the source, so both are taken first.
-    const Handler write =
-        (events & (POLLOUT | kFailed)) ? std::exchange(mWriteHandler, nullptr) : Handler();
-    const Handler read = (events & (POLLIN | kFailed)) ? mReadHandler : Handler();
-    if (read) {
-        read();
-    }
-    if (write) {
-        write();
-    }
+    // Either handler may replace the handlers, remove the source or destroy it, and what is called
+    // is a copy of its own.
+    const std::weak_ptr<int> life = mLife;
+    if (const Handler read = (events & (POLLIN | kFailed)) ? mReadHandler : nullptr) read();
+    if (life.expired() || !getLoop() || !(events & (POLLOUT | kFailed))) return;
+    if (const Handler write = std::exchange(mWriteHandler, nullptr)) write();
 }
 
 }  // namespace Foundation

@@ -4,7 +4,9 @@
 
 #include <cstdint>
 #include <functional>
+#include <memory>
 #include <string>
+#include <utility>
 
 namespace Foundation {
 
@@ -41,8 +43,8 @@ class RunLoopSource : Uncopyable {
     /// tells what the descriptor is ready for, 0 after `readyNow` or a deadline. May remove or
     /// destroy the source.
     virtual void ready(short events) = 0;
-    /// Whether a run of the loop inside `ready` may call `ready` again. Asked when the source joins
-    /// a mode.
+    /// Whether a run of the loop inside `ready`, in whatever mode, may call `ready` again. The same
+    /// for the life of the source.
     virtual bool isReentrant() const noexcept { return false; }
 
     RunLoop* mLoop = nullptr;
@@ -59,7 +61,8 @@ class FileDescriptorSource : public RunLoopSource {
     /// Called in every turn in which there is something to read, an error or a hang-up. Null stops
     /// the watch.
     void setReadHandler(Handler handler) { mReadHandler = std::move(handler); }
-    /// Called once, when the descriptor can next be written to or has failed; ask anew for more.
+    /// Called once, when the descriptor can next be written to or has failed; ask anew for more. In
+    /// a turn with both, the read handler is called first.
     void awaitWritable(Handler handler) { mWriteHandler = std::move(handler); }
 
  private:
@@ -69,6 +72,7 @@ class FileDescriptorSource : public RunLoopSource {
     int mFD;
     Handler mReadHandler;
     Handler mWriteHandler;
+    std::shared_ptr<int> mLife = std::make_shared<int>();  ///< ends with the source
 };
 
 }  // namespace Foundation

@@ -7,6 +7,7 @@
 #include <fcntl.h>
 #include <glib.h>
 #include <gtest/gtest.h>
+#include <sys/socket.h>
 #include <unistd.h>
 
 #include <stdexcept>
@@ -284,6 +285,102 @@ TEST_F(RunLoopTest, ServesTimersInTheLoopOfTheApplication) {
     EXPECT_EQ(noted(), Notes({"fired"}));
 }
 
+TEST_F(RunLoopTest, StopOutsideOfARunDoesNothing) {
+    clock.setAdvancesWhenIdle(true);
+    loop.stop();
+    EXPECT_EQ(loop.runInMode("private", 1, false), RunLoop::Result::TimedOut);
+}
+
+TEST_F(RunLoopTest, ATimerWaitsForItsDateAfterTheClockWasSetBack) {
+    const double start = clock.now();
+    at(10, "on its date");
+    clock.jumpTo(start - 3600);
+    clock.advanceTo(start + 9);
+    EXPECT_EQ(noted(), Notes());
+    clock.advanceTo(start + 10);
+    EXPECT_EQ(noted(), Notes({"on its date"}));
+}
+
+TEST_F(RunLoopTest, ARunEndsWhenTheClockIsSetPastItsDeadline) {
+    arm(0, 0, [&] { clock.jumpTo(clock.now() + 3600); });
+    EXPECT_EQ(loop.runInMode("private", 30, false), RunLoop::Result::TimedOut);
+}
+
+TEST_F(RunLoopTest, ARunInsideAHandlerDoesNotCallItAgainInAnyMode) {
+    Pipe pipe;
+    FileDescriptorSource source(pipe.fds[0]);
+    clock.setAdvancesWhenIdle(true);
+    source.setReadHandler([&] {
+        notes.push_back("begins");
+        loop.runInMode("private", 1, false);
+        loop.runInMode(RunLoop::kDefaultMode, 1, false);
+        pipe.empty();
+        notes.push_back("ends");
+    });
+    source.addTo(loop, RunLoop::kCommonModes);
+    EXPECT_EQ(write(pipe.fds[1], "x", 1), 1);
+    loop.turn();
+    EXPECT_EQ(noted(), Notes({"begins", "ends"}));
+    EXPECT_EQ(write(pipe.fds[1], "x", 1), 1);
+    loop.turn("private");
+    EXPECT_EQ(noted(), Notes({"begins", "ends"}));
+}
+
+TEST_F(RunLoopTest, AReadHandlerMayEndTheSourceBeforeItsWriteHandler) {
+    int fds[2];
+    ASSERT_EQ(socketpair(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC, 0, fds), 0);
+    EXPECT_EQ(write(fds[1], "x", 1), 1);
+    auto source = std::make_unique<FileDescriptorSource>(fds[0]);
+    source->awaitWritable([&] { notes.push_back("write"); });
+    source->setReadHandler([&] {
+        notes.push_back("read");
+        source.reset();
+    });
+    source->addTo(loop, RunLoop::kDefaultMode);
+    loop.turn();
+    EXPECT_EQ(noted(), Notes({"read"}));
+
+    source = std::make_unique<FileDescriptorSource>(fds[0]);
+    source->awaitWritable([&] { notes.push_back("write"); });
+    source->setReadHandler([&] {
+        notes.push_back("read");
+        source->removeFromLoop();
+    });
+    source->addTo(loop, RunLoop::kDefaultMode);
+    loop.turn();
+    EXPECT_EQ(noted(), Notes({"read"}));
+    close(fds[0]);
+    close(fds[1]);
+}
+
+TEST_F(RunLoopTest, ARunInsideAPerformedCallServesTheCallsBehindIt) {
+    loop.perform([this] {
+        notes.push_back("outer begins");
+        loop.runInMode("private", kForever, false);
+        notes.push_back("outer ends");
+    });
+    loop.perform([this] { notes.push_back("second"); });
+    loop.perform([this] { loop.stop(); });
+    loop.turn();
+    EXPECT_EQ(noted(), Notes({"outer begins", "second", "outer ends"}));
+}
+
+TEST_F(RunLoopTest, AThreadThatEndsLeavesItsSourcesAndTimersInNoLoop) {
+    Pipe pipe;
+    FileDescriptorSource source(pipe.fds[0]);
+    const Ref<RunLoopTimer> timer(new RunLoopTimer(clock.now() + 1, 0, [] {}));
+    std::thread other([&] {
+        RunLoop& mine = RunLoop::current();
+        source.addTo(mine, RunLoop::kCommonModes);
+        mine.addTimer(timer, "private");
+        mine.turn("private");
+    });
+    other.join();
+    EXPECT_EQ(source.getLoop(), nullptr);
+    EXPECT_FALSE(timer->isValid());
+    EXPECT_EQ(timer->getRefCount(), 1u);
+}
+
 TEST_F(RunLoopTest, EachThreadHasALoopOfItsOwn) {
     RunLoop* others = nullptr;
     std::thread other([&] {
@@ -293,6 +390,46 @@ TEST_F(RunLoopTest, EachThreadHasALoopOfItsOwn) {
     other.join();
     EXPECT_NE(others, &loop);
     EXPECT_EQ(&RunLoop::current(), &loop);
+}
+
+namespace {
+
+/// Counts how often its loop asks before it waits.
+class AskedSource : public RunLoopSource {
+ public:
+    int asked = 0;
+
+ private:
+    Interest interest() noexcept override {
+        ++asked;
+        return {};
+    }
+    void ready(short) override {}
+};
+
+}  // namespace
+
+TEST(RunLoop, ALoopInsideARunThatIsOverdueWaits) {
+    RunLoop& loop = RunLoop::current();
+    AskedSource source;
+    GMainLoop* inner = g_main_loop_new(nullptr, FALSE);
+    const auto runInner = [&] {
+        source.addTo(loop, RunLoop::kDefaultMode);
+        g_timeout_add(
+            20,
+            [](gpointer main) -> gboolean {
+                g_main_loop_quit(static_cast<GMainLoop*>(main));
+                return G_SOURCE_REMOVE;
+            },
+            inner);
+        g_main_loop_run(inner);
+    };
+    const Ref<RunLoopTimer> timer(new RunLoopTimer(Clock::current().now(), 0, runInner));
+    loop.addTimer(timer, RunLoop::kDefaultMode);
+    EXPECT_EQ(loop.runInMode(RunLoop::kDefaultMode, 0, false), RunLoop::Result::TimedOut);
+    EXPECT_GT(source.asked, 0);
+    EXPECT_LT(source.asked, 20);
+    g_main_loop_unref(inner);
 }
 
 TEST(RunLoop, WaitsForTheMachinesClock) {
