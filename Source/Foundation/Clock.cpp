@@ -1,11 +1,14 @@
 #include "Foundation/Clock.h"
 
 #include <cerrno>
+#include <cmath>
 #include <ctime>
 
 namespace Foundation {
 
 namespace {
+
+constexpr double kLongest = 1e9;  // three decades: what the system's own types can hold
 
 class SystemClock : public Clock {
  public:
@@ -18,6 +21,7 @@ class SystemClock : public Clock {
 
     void sleep(double seconds) override {
         if (!(seconds > 0)) return;
+        seconds = std::fmin(seconds, kLongest);
         std::timespec left = {};
         left.tv_sec = static_cast<std::time_t>(seconds);
         left.tv_nsec = static_cast<long>((seconds - static_cast<double>(left.tv_sec)) * 1e9);

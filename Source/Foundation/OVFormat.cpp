@@ -32,7 +32,13 @@ bool resolveFlags(const Conversion& c, Arguments& arguments, std::string& out) {
         }
         const OVFormatArgument* number = arguments.take('d');
         if (!number) return false;
-        out += std::to_string(static_cast<int>(number->signedValue()));
+        const int value = static_cast<int>(number->signedValue());
+        // In C a negative precision stands for none.
+        if (value < 0 && out.ends_with('.')) {
+            out.pop_back();
+        } else {
+            out += std::to_string(value);
+        }
     }
     return true;
 }

@@ -13,11 +13,11 @@
 namespace Foundation {
 
 /// The public form of an error. `url` is the text of the URL that the work was about, or empty.
-/// Errors of URL loading get a description and the URL, `OVInternalError` and `OVNotAFeedError`
-/// their three texts and the URL; others have neither. What has no public form becomes
-/// `OVInternalError`.
+/// Errors of URL loading get a description and the URL, those of `OVErrorDomain` what
+/// `errorWithCode` gives; others have neither. What has no public form becomes `OVInternalError`.
 OVError errorWithNetError(const NetError& error, std::string_view url);
-/// The error of `OVErrorDomain` with this code.
+/// The error of `OVErrorDomain` with this code and the URL; `OVInternalError` and `OVNotAFeedError`
+/// get their three texts.
 OVError errorWithCode(int code, std::string_view url);
 
 /// Reports an exception that reached the public interface in `where`, and throws `OVException`

@@ -16,6 +16,7 @@ TEST(OVFormat, FollowsPrintf) {
     EXPECT_EQ(OVFormat("%.3f %g %.2e", 1.5, 0.5, 12345.678), "1.500 0.5 1.23e+04");
     EXPECT_EQ(OVFormat("%s|%6s|%-6s|%.2s", "abc", "abc", "abc", "abc"), "abc|   abc|abc   |ab");
     EXPECT_EQ(OVFormat("%*d|%.*f", 5, 42, 1, 2.25), "   42|2.2");
+    EXPECT_EQ(OVFormat("%*d|%.*f", -5, 42, -1, 2.25), "42   |2.250000");
     EXPECT_EQ(OVFormat("%c%%", 'x'), "x%");
     EXPECT_EQ(OVFormat("nothing"), "nothing");
 }

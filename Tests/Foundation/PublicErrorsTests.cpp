@@ -62,6 +62,7 @@ TEST(PublicErrors, DoNotExplainOtherCodesOfTheLibrary) {
     for (const int code : {0, 3, 99, 200, 201, 202, 203}) {
         EXPECT_TRUE(hasNoUserInfo(errorWithCode(code, ""))) << code;
         EXPECT_EQ(errorWithCode(code, "").code(), code);
+        EXPECT_EQ(errorWithCode(code, kURL).URL(), kURL);
     }
 }
 

@@ -151,6 +151,20 @@ TEST(RefCounted, EndsInSilenceWhenAPoolDrainsIt) {
     EXPECT_TRUE(log.lines().empty());
 }
 
+TEST(RefCounted, IsStillMarkedAsPooledWhenAPoolEndsIt) {
+    struct Marked : RefCounted {
+        explicit Marked(bool* atItsEnd) : wasPooled(atItsEnd) {}
+        ~Marked() override { *wasPooled = isPooled(); }
+        bool* wasPooled;
+    };
+    bool wasPooled = false;
+    {
+        AutoreleasePool pool;
+        (new Marked(&wasPooled))->autorelease();
+    }
+    EXPECT_TRUE(wasPooled);
+}
+
 TEST(RefCounted, DescribesItselfByClassAddressCountAndPool) {
     Deaths deaths;
     AutoreleasePool pool;
