@@ -31,8 +31,8 @@ int followLinks(std::string& path) {
         const ssize_t length = readlink(path.c_str(), target, sizeof target);
         if (length < 0) return errno == EINVAL || errno == ENOENT ? 0 : errno;
         if (length == sizeof target) return ENAMETOOLONG;
-        const std::string next(target, static_cast<std::size_t>(length));
-        path = next.starts_with('/') ? next : directoryOf(path) + next;
+        const std::string_view next(target, static_cast<std::size_t>(length));
+        path = next.starts_with('/') ? std::string(next) : directoryOf(path).append(next);
     }
     return ELOOP;
 }

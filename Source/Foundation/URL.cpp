@@ -32,10 +32,12 @@ StringReturner textOf(std::optional<std::string_view> part) {
 
 /// The text behind the escapes; null where there is none or it is no UTF-8.
 StringReturner unescapedTextOf(std::optional<std::string_view> part, std::string_view leave = {}) {
-    std::optional<std::string> bytes;
-    if (part) bytes = unescapeURLText(*part, leave);
-    if (!bytes || !g_utf8_validate_len(bytes->data(), bytes->size(), nullptr)) return nullptr;
-    return String::string(std::move(*bytes));
+    if (!part) return nullptr;
+    const std::optional<std::string> bytes = unescapeURLText(*part, leave);
+    if (!bytes) return nullptr;
+    const std::string& text = *bytes;
+    const bool isText = g_utf8_validate_len(text.data(), text.size(), nullptr);
+    return isText ? String::string(text) : nullptr;
 }
 
 [[noreturn]] void failBadPath() {

@@ -1,6 +1,5 @@
 #include "Foundation/URLCharacters.h"
 
-#include <algorithm>
 #include <utility>
 
 namespace Foundation {
