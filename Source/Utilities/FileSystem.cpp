@@ -21,9 +21,11 @@ namespace {
 URL* sStorageBaseURL = nullptr;
 URL* sStorageURL = nullptr;
 URL* sStorageTruthURL = nullptr;
+Bundle* sClientBundle = nullptr;
 
 /// Puts what `returner` holds into `place` and lets go of what was there.
-void store(URL*& place, URLReturner returner) {
+template <class T>
+void store(T*& place, Returner<T> returner) {
     Foundation::release(std::exchange(place, returner.detach()));
 }
 
@@ -69,8 +71,8 @@ std::string FileSystem::findDataDirectory(const char* xdgDataHome, const char* h
 
 void FileSystem::setStorageBaseURL(URL* url) {
     store(sStorageBaseURL, URLReturner::retained(url));
-    store(sStorageURL, nullptr);
-    store(sStorageTruthURL, nullptr);
+    store<URL>(sStorageURL, nullptr);
+    store<URL>(sStorageTruthURL, nullptr);
 }
 
 URLReturner FileSystem::getStorageBaseURL() {
@@ -108,6 +110,18 @@ URLReturner FileSystem::getStorageEnclosuresURL() {
 
 URLReturner FileSystem::getStorageIncompleteEnclosuresURL() {
     return append(getStorageEnclosuresURL(), "Incomplete", true);
+}
+
+Bundle* FileSystem::getFrameworkBundle() {
+    return Bundle::frameworkBundle();
+}
+
+Bundle* FileSystem::getClientBundle() {
+    return sClientBundle ? sClientBundle : getFrameworkBundle();
+}
+
+void FileSystem::setClientBundle(Bundle* bundle) {
+    store(sClientBundle, Returner<Bundle>::retained(bundle));
 }
 
 URLReturner FileSystem::getTempURL() {

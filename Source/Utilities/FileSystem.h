@@ -1,5 +1,6 @@
 #pragma once
 
+#include "Foundation/Bundle.h"
 #include "Foundation/String.h"
 #include "Foundation/URL.h"
 
@@ -21,6 +22,7 @@ namespace Compatibility {
 /// No accessor makes or looks at a file.
 class FileSystem {
  public:
+    using Bundle = Foundation::Bundle;
     using String = Foundation::String;
     using URL = Foundation::URL;
     using URLReturner = Foundation::URLReturner;
@@ -39,6 +41,13 @@ class FileSystem {
     static URLReturner getStorageTruthURL();
     static URLReturner getStorageEnclosuresURL();
     static URLReturner getStorageIncompleteEnclosuresURL();
+
+    /// The library's own resources.
+    static Bundle* getFrameworkBundle();
+    /// The resources of the running program: what it has set, or else the library's.
+    static Bundle* getClientBundle();
+    /// For a program that has resources of its own. Null takes it back.
+    static void setClientBundle(Bundle* bundle);
 
     /// "/tmp".
     static URLReturner getTempURL();

@@ -75,6 +75,17 @@ TEST_F(FileSystemTest, LooksTheBaseUpOnce) {
     EXPECT_EQ(path(FileSystem::getStorageBaseURL()), "/first/");
 }
 
+TEST(FileSystem, TakesTheLibrarysResourcesForAProgramWithoutItsOwn) {
+    EXPECT_EQ(FileSystem::getFrameworkBundle(), Bundle::frameworkBundle());
+    EXPECT_EQ(FileSystem::getClientBundle(), Bundle::frameworkBundle());
+    const Ref<Bundle> own = Bundle::bundle("/somewhere", "program");
+    FileSystem::setClientBundle(own);
+    EXPECT_EQ(FileSystem::getClientBundle(), own.get());
+    EXPECT_EQ(FileSystem::getFrameworkBundle(), Bundle::frameworkBundle());
+    FileSystem::setClientBundle(nullptr);
+    EXPECT_EQ(FileSystem::getClientBundle(), Bundle::frameworkBundle());
+}
+
 TEST(FileSystem, HasATemporaryDirectory) {
     EXPECT_EQ(path(FileSystem::getTempURL()), "/tmp/");
 }
