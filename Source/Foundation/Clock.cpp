@@ -38,8 +38,9 @@ Clock* sCurrent = nullptr;
 }  // namespace
 
 Clock& Clock::current() {
-    static SystemClock sSystemClock;
-    return sCurrent ? *sCurrent : sSystemClock;
+    // Never destroyed, as what ends with the process may still ask for the time.
+    static auto* const sSystemClock = new SystemClock;
+    return sCurrent ? *sCurrent : *sSystemClock;
 }
 
 void Clock::setCurrent(Clock* clock) {

@@ -69,13 +69,14 @@ class JournalSink : public LogSink {
 }  // namespace
 
 LogSink& standardErrorSink() {
-    static StandardErrorSink sSink;
-    return sSink;
+    // Neither sink is ever destroyed, as what ends with the process may still log.
+    static auto* const sSink = new StandardErrorSink;
+    return *sSink;
 }
 
 LogSink& journalSink() {
-    static JournalSink sSink;
-    return sSink;
+    static auto* const sSink = new JournalSink;
+    return *sSink;
 }
 
 }  // namespace Foundation

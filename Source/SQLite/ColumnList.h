@@ -1,6 +1,8 @@
 #pragma once
 
+#include "Foundation/Uncopyable.h"
 #include "SQLite/SQLText.h"
+#include "SQLite/Types.h"
 
 #include <initializer_list>
 #include <vector>
@@ -54,26 +56,29 @@ ColumnSpec toMany() {
 
 /// The columns of a row class, listed once: by this list a row is inserted, updated, read and
 /// unloaded, so that names, order and members agree. Has the order of the table; the to-many
-/// columns are kept apart. A function-static constant of the class.
-class ColumnList {
+/// columns are kept apart. A function-static constant of the class, as it lives as long as the
+/// process.
+class ColumnList : Foundation::Uncopyable {
  public:
     static constexpr std::size_t kMostColumns = 64;  ///< as a mask has a bit for each
 
     /// Throws `AssertionFailure` for more columns than a mask can hold.
     ColumnList(std::initializer_list<ColumnSpec> columns);
 
-    auto begin() const { return mColumns.begin(); }
-    auto end() const { return mColumns.end(); }
-    std::size_t count() const { return mColumns.size(); }
-    const ColumnSpec& at(std::size_t index) const { return mColumns[index]; }
-    const std::vector<ColumnSpec>& toManyColumns() const { return mToMany; }
+    auto begin() const { return mColumns->begin(); }
+    auto end() const { return mColumns->end(); }
+    std::size_t count() const { return mColumns->size(); }
+    const ColumnSpec& at(std::size_t index) const { return (*mColumns)[index]; }
+    const std::vector<ColumnSpec>& toManyColumns() const { return *mToMany; }
 
     /// "insert into table (a, b) values (?, ?)"
     SQLText insertText(const char* table) const;
 
  private:
-    std::vector<ColumnSpec> mColumns;
-    std::vector<ColumnSpec> mToMany;
+    // Never destroyed: the database saves rows when it ends with the process, behind the end of
+    // what was made after it.
+    std::vector<ColumnSpec>* const mColumns;
+    std::vector<ColumnSpec>* const mToMany;
 };
 
 }  // namespace SQLite
