@@ -26,8 +26,8 @@ class Date : public PFRefCounted {
     /// warning, if it says none.
     static DateReturner parseDate(const String* text);
 
-    /// The text by a formatter; null for none. The zone of `getAtomFormat` gets its colon here,
-    /// which no pattern of ICU's can give it in all cases.
+    /// The text by a formatter; null for none. In that of `getAtomFormat`, and of no other, the
+    /// zone gets the colon that RFC 3339 asks for.
     StringReturner toStringUsingFormat(DateFormatter* formatter) const;
     /// "2005-10-21T00:12:34.000+0000", in the default time zone.
     static DateFormatter* getAtomFormat();

@@ -11,6 +11,8 @@ namespace Foundation {
 namespace {
 
 constexpr std::int64_t kSecondsPerDay = 86400;
+constexpr std::int64_t kSecondsPerHour = 3600;
+constexpr std::int64_t kSecondsPerMinute = 60;
 constexpr std::int64_t kDaysPer400Years = 146097;
 constexpr std::int64_t kDaysPer100Years = 36524;
 constexpr std::int64_t kDaysPer4Years = 1461;
@@ -100,15 +102,15 @@ GregorianDate GregorianDate::inGMT(double absoluteTime) {
 
     GregorianDate date;
     setDay(date, days);
-    date.hour = static_cast<std::int8_t>(secondOfDay / 3600);
-    date.minute = static_cast<std::int8_t>(secondOfDay / 60 % 60);
+    date.hour = static_cast<std::int8_t>(secondOfDay / kSecondsPerHour);
+    date.minute = static_cast<std::int8_t>(secondOfDay / kSecondsPerMinute % 60);
     date.second = static_cast<double>(secondOfDay % 60) + fraction;
     return date;
 }
 
 double GregorianDate::getAbsoluteTimeInGMT() const {
-    const std::int64_t seconds =
-        toDays(year, month, day) * kSecondsPerDay + hour * 3600 + minute * 60;
+    const std::int64_t seconds = toDays(year, month, day) * kSecondsPerDay +
+                                 hour * kSecondsPerHour + minute * kSecondsPerMinute;
     return static_cast<double>(seconds) + second;
 }
 

@@ -39,8 +39,10 @@ std::string expected(const std::string& text) {
         if (part != -1) mask |= bit;
         bit *= 2;
     }
-    std::int32_t hour = field<std::int8_t>(p->hour);
-    if (p->hour != -1 && p->meridian != -1) hour += p->meridian;
+    auto hour = field<std::int8_t>(p->hour);
+    if (p->hour != -1 && p->meridian != -1) {
+        hour = static_cast<std::int8_t>(hour + p->meridian);
+    }
     const auto offset = static_cast<std::int32_t>(static_cast<std::uint32_t>(p->offsetMinutes) *
                                                   (p->offsetMinutes == -1 ? 1u : 60u));
     return OVFormat("%d-%d-%d %d:%d:%g mask %u offset %d", field<std::int32_t>(p->year),

@@ -1,6 +1,7 @@
 #include "Foundation/Translations.h"
 
 #include "Foundation/EnglishTexts.h"
+#include "Foundation/ErrorTexts.h"
 #include "Support/Language.h"
 
 #include <gtest/gtest.h>
@@ -88,7 +89,15 @@ TEST(Translations, IntoGermanAreOfKeysThatThereAre) {
 
 TEST(Translations, IntoGermanAreComplete) {
     const std::vector<std::string> keys = translatedKeys("de");
+    int errors = 0;
     for (const std::string_view key : englishKeys()) {
         EXPECT_EQ(std::count(keys.begin(), keys.end(), key), 1) << key;
     }
+    for (int code = -4000; code <= 0; ++code) {
+        const std::string text = describeURLError(code);
+        if (text.empty()) continue;
+        EXPECT_EQ(std::count(keys.begin(), keys.end(), text), 1) << text;
+        ++errors;
+    }
+    EXPECT_GT(errors, 15);
 }
