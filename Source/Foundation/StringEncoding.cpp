@@ -41,7 +41,7 @@ std::optional<std::string> convert(const char* from, const char* to, std::string
     UChar* pivotSource = pivot;
     UChar* pivotTarget = pivot;
     const char* in = bytes.data();
-    bool isFirst = true;
+    UBool isFirst = 1;
     do {
         char* out = chunk;
         status = U_ZERO_ERROR;
@@ -49,7 +49,7 @@ std::optional<std::string> convert(const char* from, const char* to, std::string
                        pivot, &pivotSource, &pivotTarget, std::end(pivot), isFirst, true, &status);
         result.append(chunk, out);
         bytes.remove_prefix(static_cast<std::size_t>(in - bytes.data()));
-        isFirst = false;
+        isFirst = 0;
     } while (status == U_BUFFER_OVERFLOW_ERROR);
     if (U_FAILURE(status)) return std::nullopt;
     return result;
