@@ -14,7 +14,10 @@ using Foundation::Ref;
 
 void ListedRow::unload() {
     for (const ColumnSpec& spec : columns()) {
-        spec.in(*this).unload();
+        Column& column = spec.in(*this);
+        // What it pointed at in memory is a change too.
+        if (spec.kind->clear) spec.kind->clear(column);
+        column.unload();
     }
     Row::unload();
 }

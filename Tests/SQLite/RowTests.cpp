@@ -286,4 +286,11 @@ TEST_F(RowTest, UnloadingGivesChangesUp) {
     item->unload();
     EXPECT_FALSE(item->isLoaded() || item->mNumber.isChanged() || item->mTitle.isLoaded());
     EXPECT_EQ(item->mNumber.getValue(), 0);
+    const Ref<Note> note = Note::make("n");
+    item->mNote.setValue(note.get());
+    item->unload();
+    EXPECT_EQ(item->mNote.getValue(), nullptr);
+    EXPECT_EQ(note->getRefCount(), 1U);
+    item->saveChanges();
+    EXPECT_EQ(count("number=0 and note=0"), 1);
 }
