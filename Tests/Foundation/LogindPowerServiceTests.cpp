@@ -51,6 +51,11 @@ class LogindPowerServiceTest : public testing::Test {
         }
         logind = std::make_unique<BackgroundProcess>(command);
         ASSERT_TRUE(turnUntil([&] { return !bus().getNameOwner(kService).empty(); }));
+        // It has the name before it is ready to answer.
+        static constexpr BusMethod kPing = {kService, kPath, "org.freedesktop.DBus.Peer", "Ping",
+                                            60};
+        const BusMessage answer = bus().callMethod(kPing);
+        ASSERT_TRUE(answer.isValid()) << answer.getErrorText();
     }
     void stopLogind() {
         logind.reset();

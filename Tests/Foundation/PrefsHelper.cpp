@@ -13,6 +13,7 @@
 #include "Foundation/ApplicationIdentity.h"
 #include "Foundation/AutoreleasePool.h"
 #include "Foundation/Logger.h"
+#include "Foundation/PreferenceFile.h"
 #include "Foundation/UntypedPref.h"
 
 #include <cstdio>
@@ -40,9 +41,22 @@ void set(Prefs& prefs, const char* key, const char* text) {
     prefs.synchronize();
 }
 
+bool isSaved(Prefs& prefs, const char* key, const std::string& text) {
+    const PreferenceFile file(PreferenceFile::pathOfDomain(prefs.getDomain()->view()));
+    const PreferenceFile::Content content = file.read();
+    const auto* value = content.values ? content.values->getAs<String>(key) : nullptr;
+    return value && value->view() == text;
+}
+
 void count(Prefs& prefs, const char* key, int changes) {
     for (int i = 1; i <= changes; ++i) {
         set(prefs, key, std::to_string(i).c_str());
+    }
+    // Where many write to a slow disk, the wait for the lock may end before this one's turn comes.
+    // The change is then kept for the next time.
+    constexpr int kMostAttempts = 30;
+    for (int i = 0; i < kMostAttempts && !isSaved(prefs, key, std::to_string(changes)); ++i) {
+        prefs.synchronize();
     }
 }
 

@@ -37,6 +37,8 @@ class SessionApplicationsTest : public testing::Test {
 
     ~SessionApplicationsTest() override { Bus::user().releaseName(kName); }
 
+    /// What is found of processes holds as long as the test wants.
+    Support::ManualClock clock;
     PrivateBus privateBus;
     std::set<std::string> processes;
     int looks = 0;
@@ -88,7 +90,6 @@ TEST_F(SessionApplicationsTest, LooksAtProcessesOnceForEachSeed) {
 }
 
 TEST_F(SessionApplicationsTest, NoticesProcessesThatCameAndWent) {
-    Support::ManualClock clock;
     const std::int32_t seed = session.getSeed();
     EXPECT_FALSE(session.isRunning("reader"));
     processes = {"reader"};
@@ -101,7 +102,6 @@ TEST_F(SessionApplicationsTest, NoticesProcessesThatCameAndWent) {
 }
 
 TEST_F(SessionApplicationsTest, DoesNothingAsLongAsNobodyAsks) {
-    Support::ManualClock clock;
     session.isRunning("reader");
     clock.advanceBy(SessionApplications::kProcessesHoldSeconds);
     const std::int32_t seed = session.getSeed();
