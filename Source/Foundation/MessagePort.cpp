@@ -45,6 +45,10 @@ MessagePort::MessagePort(String* name, std::size_t capacity) : mRunLoop(&RunLoop
 }
 
 MessagePort::~MessagePort() {
+    invalidate();
+}
+
+void MessagePort::invalidate() {
     mLocalPort->invalidate();
 }
 

@@ -33,6 +33,10 @@ class MessagePort : Uncopyable {
     /// the result. What it throws is reported.
     virtual Returner<Data> receive(MessageID id, Data* data) = 0;
 
+    /// Ends the port: it takes no more messages, and drops those that are on their way. On the
+    /// thread of the port's loop.
+    void invalidate();
+
     RunLoop* const mRunLoop;
 
  private:

@@ -58,6 +58,7 @@ class ExposedPort : public NotificationMessagePort {
  public:
     explicit ExposedPort(std::size_t capacity = kCapacity)
         : NotificationMessagePort(nullptr, capacity) {}
+    using NotificationMessagePort::invalidate;
     using NotificationMessagePort::receive;
 };
 
@@ -206,6 +207,21 @@ TEST_F(NotificationMessagePortTest, RetriesForAsLongAsThePortIsFull) {
     turnOther();
     loop.turn();
     EXPECT_EQ(noted(), Notes({"a", "b"}));
+}
+
+TEST_F(NotificationMessagePortTest, DropsWithAWarningWhatCannotBeSentAtAll) {
+    ExposedPort port;
+    port.invalidate();
+    LogCapture log;
+    const Ref<String> name = String::string(std::string("name"));
+    const Notification notification{name.get(), nullptr, nullptr};
+    for (int i = 1; i <= 2; ++i) {
+        other.run([&] { port.sendNotification(&notification); });
+        EXPECT_EQ(log.count("[WARNING] Failed to relay distributed notification: PFMessagePort err "
+                            "-3"),
+                  i);
+        EXPECT_EQ(name->getRetainCount(), 1u);
+    }
 }
 
 TEST_F(NotificationMessagePortTest, AssertsThatAMessageIsANotification) {
