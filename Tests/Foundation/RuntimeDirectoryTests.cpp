@@ -80,9 +80,12 @@ TEST_F(RuntimeDirectoryTest, RefusesLinksAndFiles) {
 }
 
 TEST_F(RuntimeDirectoryTest, RefusesThatOfAnotherUser) {
-    if (geteuid() != 0) GTEST_SKIP() << "only root can give a directory away";
-    const std::string others = temp.makeDirectory("others");
-    ASSERT_EQ(chown(others.c_str(), 12345, 12345), 0);
+    // Only root can give a directory away; for all others, root's own is one.
+    std::string others = "/root";
+    if (geteuid() == 0) {
+        others = temp.makeDirectory("others");
+        ASSERT_EQ(chown(others.c_str(), 12345, 12345), 0);
+    }
     EXPECT_FALSE(RuntimeDirectory::makePrivate(others, error));
     EXPECT_FALSE(RuntimeDirectory::isTrusted(others));
 }
