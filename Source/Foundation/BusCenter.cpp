@@ -125,10 +125,12 @@ bool BusCenter::isFromItsPoster(const std::string& name, const BusMessage& signa
 }
 
 void BusCenter::callObservers(String* name, String* object, Dictionary* info) {
+    const std::string nameText = name->utf8();
+    const std::string objectText = wireForm(object);
     std::vector<std::pair<void*, Callback>> called;
     for (const Registration& registration : mRegistrations) {
         const std::pair entry(registration.observer, registration.callback);
-        if (!registration.wants(wireForm(name), wireForm(object))) continue;
+        if (!registration.wants(nameText, objectText)) continue;
         if (std::find(called.begin(), called.end(), entry) == called.end()) called.push_back(entry);
     }
     for (const auto& [observer, callback] : called) {

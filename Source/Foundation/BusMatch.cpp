@@ -24,10 +24,6 @@ void addUnlessEmpty(std::string& rule, const char* key, const std::string& value
     if (!value.empty()) addPart(rule, key, value);
 }
 
-bool isWanted(const std::string& wanted, const std::string& found) {
-    return wanted.empty() || wanted == found;
-}
-
 bool isWanted(const std::optional<std::string>& wanted, const char* found) {
     return !wanted || (found && *wanted == found);
 }
@@ -46,8 +42,7 @@ std::string BusMatch::getRule() const {
 }
 
 bool BusMatch::matches(const BusMessage& message) const {
-    return message.isSignal() && isWanted(path, message.getPath()) &&
-           isWanted(interface, message.getInterface()) && isWanted(member, message.getMember()) &&
+    return message.isSignal(path, interface, member) &&
            isWanted(argument0, message.getStringArgument(0)) &&
            isWanted(argument1, message.getStringArgument(1));
 }

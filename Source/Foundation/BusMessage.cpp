@@ -54,6 +54,17 @@ bool BusMessage::isSignal() const {
     return mMessage && sd_bus_message_is_signal(mMessage, nullptr, nullptr) > 0;
 }
 
+bool BusMessage::isSignal(const std::string& path, const std::string& interface,
+                          const std::string& member) const {
+    if (!isSignal()) return false;
+    const auto isWanted = [](const std::string& wanted, const char* found) {
+        return wanted.empty() || (found && wanted == found);
+    };
+    return isWanted(path, sd_bus_message_get_path(mMessage)) &&
+           isWanted(interface, sd_bus_message_get_interface(mMessage)) &&
+           isWanted(member, sd_bus_message_get_member(mMessage));
+}
+
 bool BusMessage::expectsReply() const {
     return mMessage && sd_bus_message_is_method_call(mMessage, nullptr, nullptr) > 0 &&
            sd_bus_message_get_expect_reply(mMessage) > 0;

@@ -31,6 +31,9 @@ class BusMessage {
     /// Whether there is a message and it is no error.
     bool isValid() const;
     bool isSignal() const;
+    /// Whether it is this signal; what is empty does not matter.
+    bool isSignal(const std::string& path, const std::string& interface,
+                  const std::string& member) const;
     /// Whether this is a call whose sender waits for an answer.
     bool expectsReply() const;
     /// The error's name, such as "org.freedesktop.DBus.Error.NoReply"; empty if this is none.

@@ -10,9 +10,10 @@ namespace Foundation {
 namespace {
 
 constexpr const char* kBusName = "org.freedesktop.DBus";
+constexpr const char* kOwnerChanged = "NameOwnerChanged";
 
 BusMatch ownerChanges(const std::string& name) {
-    BusMatch match{.sender = kBusName, .interface = kBusName, .member = "NameOwnerChanged"};
+    BusMatch match{.sender = kBusName, .interface = kBusName, .member = kOwnerChanged};
     if (!name.empty()) match.argument0 = name;
     return match;
 }
@@ -115,7 +116,7 @@ void Bus::findOwner(const std::string& name, WatchedName& watched) {
 
 void Bus::dispatch(BusMessage& message) {
     if (message.isSignal()) {
-        if (ownerChanges({}).matches(message) && message.getSender() == kBusName) {
+        if (message.isSignal({}, kBusName, kOwnerChanged) && message.getSender() == kBusName) {
             noteNameOwnerChanged(message);
         }
         dispatchSignal(message);
@@ -126,14 +127,17 @@ void Bus::dispatch(BusMessage& message) {
 }
 
 void Bus::dispatchSignal(BusMessage& signal) {
-    const Subscriptions current = mSubscriptions;
-    for (const auto& [id, subscription] : current) {
-        if (subscription->isOver || !subscription->signalHandler) continue;
-        if (!subscription->match.matches(signal)) continue;
-        if (!isFromItsSender(subscription->match, signal)) continue;
+    std::vector<std::shared_ptr<Subscription>> takers;
+    for (const auto& [id, subscription] : mSubscriptions) {
+        const bool takesIt = subscription->signalHandler && subscription->match.matches(signal) &&
+                             isFromItsSender(subscription->match, signal);
+        if (takesIt) takers.push_back(subscription);
+    }
+    for (const std::shared_ptr<Subscription>& subscription : takers) {
+        if (subscription->isOver) continue;
         signal.rewind();
         callGuarded("void Foundation::Bus::dispatchSignal(BusMessage &)",
-                    [&, subscription = subscription] { subscription->signalHandler(signal); });
+                    [&] { subscription->signalHandler(signal); });
     }
 }
 
