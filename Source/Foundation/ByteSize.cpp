@@ -1,3 +1,5 @@
+#include "Foundation/ByteSize.h"
+
 #include "Foundation/Bundle.h"
 #include "Foundation/CurrentLocale.h"
 #include "Foundation/String.h"
@@ -8,12 +10,6 @@
 namespace Foundation {
 
 namespace {
-
-/// A text for a number of some unit: the key of its format, and the number.
-struct Size {
-    const char* key;
-    double number;
-};
 
 /// The unit's keys for numbers with one whole digit, with two and with three.
 struct Unit {
@@ -28,22 +24,6 @@ constexpr Unit kUnits[] = {
     {"%.1f GB (1.0)", "%.1f GB (10.0)", "%.0f GB"},
 };
 constexpr double kUnit = 1024;
-
-/// The limits are where a number would round up to one more digit than its format has room for.
-Size chooseSize(double bytes) {
-    if (bytes == 0) return {"0 bytes", 0};
-    if (bytes == 1) return {"1 byte", 1};
-    if (bytes < 100) return {"%.0f bytes", bytes};
-    double number = bytes / kUnit;
-    if (bytes < 1000) return {"%.1f KB (0.1)", number};
-    for (const Unit& unit : kUnits) {
-        if (number < 9.95) return {unit.ones, number};
-        if (number < 99.95) return {unit.tens, number};
-        if (number < 999.5) return {unit.hundreds, number};
-        number /= kUnit;
-    }
-    return {kUnits[2].hundreds, number * kUnit};
-}
 
 /// `format` with `number`, whose decimal sign is the locale's.
 std::string formatNumber(std::string_view format, double number) {
@@ -60,8 +40,25 @@ std::string formatNumber(std::string_view format, double number) {
 
 }  // namespace
 
+// The limits are where a number would round up to one more digit than its format has room for.
+ByteSize ByteSize::of(long long count) {
+    const double bytes = std::fabs(static_cast<double>(count));
+    if (bytes == 0) return {"0 bytes", 0};
+    if (bytes == 1) return {"1 byte", 1};
+    if (bytes < 100) return {"%.0f bytes", bytes};
+    double number = bytes / kUnit;
+    if (bytes < 1000) return {"%.1f KB (0.1)", number};
+    for (const Unit& unit : kUnits) {
+        if (number < 9.95) return {unit.ones, number};
+        if (number < 99.95) return {unit.tens, number};
+        if (number < 999.5) return {unit.hundreds, number};
+        number /= kUnit;
+    }
+    return {kUnits[2].hundreds, number * kUnit};
+}
+
 StringReturner String::representationForBytes(long long count) {
-    const Size size = chooseSize(std::fabs(static_cast<double>(count)));
+    const ByteSize size = ByteSize::of(count);
     return string(formatNumber(localizedText(size.key), size.number));
 }
 
