@@ -64,7 +64,7 @@ Returner<PFRefCounted> PropertyListReader::read(std::string_view xml) {
     const std::unique_ptr<GError, void (*)(GError*)> error(rawError, g_error_free);
     if (mFailure) std::rethrow_exception(mFailure);
     if (!isRead) throw PropertyListError(error ? error->message : "the text is no XML");
-    if (!mHasValue) throw PropertyListError("the plist element is empty");
+    if (!mHasValue) throw PropertyListError("there is no plist element");
     return Returner<PFRefCounted>(std::move(mValue));
 }
 
@@ -123,7 +123,9 @@ void PropertyListReader::startContainer(std::string_view name) {
 
 void PropertyListReader::endElement(std::string_view) {
     if (!mLeaf) {
-        if (!mContainers.empty()) endContainer();
+        if (!mContainers.empty()) return endContainer();
+        // Checked here, since the parser would go on to another root element.
+        if (!mHasValue) throw PropertyListError("the plist element is empty");
         return;
     }
     const std::string name = *mLeaf;

@@ -206,7 +206,7 @@ TEST(PropertyList, SaysWhatIsWrongAndWhere) {
               "error: line 2: not an integer of 64 bits: \"12x\"");
     EXPECT_EQ(describe("<real>0,5</real>"), "error: line 2: not a real number: \"0,5\"");
     EXPECT_EQ(describe("<date>yesterday</date>"), "error: line 2: not a date: \"yesterday\"");
-    EXPECT_EQ(describe(""), "error: the plist element is empty");
+    EXPECT_EQ(describe(""), "error: line 2: the plist element is empty");
     EXPECT_EQ(describeXML("<html/>"), "error: line 1: the root element is not plist");
     EXPECT_NE(describeXML("<plist><array>").find("line 1"), std::string::npos);
 }
@@ -246,6 +246,10 @@ TEST(PropertyList, RefusesWhatIsNoXML) {
          {std::string(), std::string("bplist00"), std::string("{ a = 1; }"), std::string(10, '\0'),
           std::string("<plist>") + '\0', std::string("\xFF\xFE<\0p\0", 6)}) {
         EXPECT_TRUE(describeXML(bytes).starts_with("error: ")) << bytes;
+    }
+    for (const char* xml : {"<plist/><true/>", "<plist><true/></plist><true/>",
+                            "<plist><true/></plist><plist/>", "<!-- nothing -->"}) {
+        EXPECT_TRUE(describeXML(xml).starts_with("error: ")) << describeXML(xml);
     }
     std::string error;
     const Ref<PFRefCounted> nothing = PropertyList::read(Bytes(), &error);
