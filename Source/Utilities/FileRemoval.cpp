@@ -1,15 +1,14 @@
 #include "Utilities/FileRemoval.h"
 
 #include "Foundation/UniqueFD.h"
+#include "Utilities/DirectoryNames.h"
 
-#include <dirent.h>
 #include <fcntl.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
 #include <cerrno>
-#include <memory>
-#include <string_view>
+#include <utility>
 #include <vector>
 
 namespace Orvane {
@@ -17,21 +16,6 @@ namespace Orvane {
 using Foundation::UniqueFD;
 
 namespace {
-
-/// The names in a directory. They are read before any is removed: what a listing gives while its
-/// directory changes is up to the file system.
-int readNames(UniqueFD directory, std::vector<std::string>& names) {
-    const std::unique_ptr<DIR, int (*)(DIR*)> list(fdopendir(directory.get()), closedir);
-    if (!list) return errno;
-    (void)directory.detach();
-    for (;;) {
-        errno = 0;
-        const dirent* entry = readdir(list.get());  // NOLINT(concurrency-*): a list of our own
-        if (!entry) return errno;
-        const std::string_view name = entry->d_name;
-        if (name != "." && name != "..") names.emplace_back(name);
-    }
-}
 
 int removeDirectoryAt(int parent, const char* name, std::size_t& removed);
 
@@ -50,8 +34,10 @@ int removeDirectoryAt(int parent, const char* name, std::size_t& removed) {
     const UniqueFD directory(openat(parent, name, flags));
     UniqueFD listed(directory ? fcntl(directory.get(), F_DUPFD_CLOEXEC, 0) : -1);
     if (!directory || !listed) return errno;
+    // All are read before any is removed: what a listing gives while its directory changes is up to
+    // the file system.
     std::vector<std::string> names;
-    if (const int error = readNames(std::move(listed), names)) return error;
+    if (const int error = DirectoryNames::read(std::move(listed), names)) return error;
     for (const std::string& item : names) {
         if (const int error = removeItemAt(directory.get(), item.c_str(), removed)) return error;
     }

@@ -4,20 +4,20 @@
 #include "Foundation/Clock.h"
 #include "Foundation/FileErrors.h"
 #include "Foundation/Logger.h"
+#include "Foundation/UniqueFD.h"
+#include "Utilities/DirectoryNames.h"
 #include "Utilities/FileRemoval.h"
 #include "Utilities/Quarantine.h"
 #include "Utilities/Trash.h"
 
-#include <dirent.h>
 #include <fcntl.h>
 #include <sys/stat.h>
 
 #include <algorithm>
 #include <cerrno>
 #include <cstdio>
-#include <memory>
 #include <string>
-#include <string_view>
+#include <utility>
 #include <vector>
 
 namespace Orvane {
@@ -74,18 +74,11 @@ int makeDirectory(const std::string& path) {
 
 /// The names in a directory, sorted.
 int listDirectory(const std::string& path, std::vector<std::string>& names) {
-    const std::unique_ptr<DIR, int (*)(DIR*)> list(opendir(path.c_str()), closedir);
-    if (!list) return errno;
-    for (;;) {
-        errno = 0;
-        const dirent* entry = readdir(list.get());  // NOLINT(concurrency-*): a list of our own
-        if (const int error = errno) return error;
-        if (!entry) break;
-        const std::string_view name = entry->d_name;
-        if (name != "." && name != "..") names.emplace_back(name);
-    }
+    UniqueFD directory(open(path.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC));
+    if (!directory) return errno;
+    const int error = DirectoryNames::read(std::move(directory), names);
     std::ranges::sort(names);
-    return 0;
+    return error;
 }
 
 bool isTaken(const std::string& path) {
