@@ -8,6 +8,7 @@
 #include "Foundation/String.h"
 #include "Support/DefaultZone.h"
 #include "Support/EnvVar.h"
+#include "Support/GMT.h"
 #include "Support/Language.h"
 #include "Support/LogCapture.h"
 #include "Support/ManualClock.h"
@@ -19,22 +20,12 @@
 using namespace Foundation;
 using Support::DefaultZone;
 using Support::EnvVar;
+using Support::inGMT;
 using Support::Language;
 using Support::LogCapture;
 using Support::ManualClock;
 
 namespace {
-
-double inGMT(int year, int month, int day, int hour = 0, int minute = 0, double second = 0) {
-    GregorianDate d;
-    d.year = year;
-    d.month = static_cast<std::int8_t>(month);
-    d.day = static_cast<std::int8_t>(day);
-    d.hour = static_cast<std::int8_t>(hour);
-    d.minute = static_cast<std::int8_t>(minute);
-    d.second = second;
-    return d.getAbsoluteTimeInGMT();
-}
 
 std::string format(double time, DateFormatter* formatter) {
     const Ref<Date> date = Date::date(time);

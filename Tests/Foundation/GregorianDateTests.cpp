@@ -1,5 +1,7 @@
 #include "Foundation/GregorianDate.h"
 
+#include "Support/GMT.h"
+
 #include <gtest/gtest.h>
 
 #include <cmath>
@@ -7,6 +9,7 @@
 #include <string>
 
 using namespace Foundation;
+using Support::inGMT;
 
 namespace {
 
@@ -15,17 +18,6 @@ std::string text(const GregorianDate& d) {
     std::snprintf(buffer, sizeof buffer, "%d-%d-%d %d:%d:%g", d.year, d.month, d.day, d.hour,
                   d.minute, d.second);
     return buffer;
-}
-
-double inGMT(int year, int month, int day, int hour = 0, int minute = 0, double second = 0) {
-    GregorianDate d;
-    d.year = year;
-    d.month = static_cast<std::int8_t>(month);
-    d.day = static_cast<std::int8_t>(day);
-    d.hour = static_cast<std::int8_t>(hour);
-    d.minute = static_cast<std::int8_t>(minute);
-    d.second = second;
-    return d.getAbsoluteTimeInGMT();
 }
 
 struct Known {

@@ -8,6 +8,7 @@
 #include "Foundation/Ref.h"
 #include "Foundation/String.h"
 #include "Support/DefaultZone.h"
+#include "Support/GMT.h"
 
 #include <gtest/gtest.h>
 
@@ -18,18 +19,9 @@
 
 using namespace Foundation;
 using Support::DefaultZone;
+using Support::inGMT;
 
 namespace {
-
-double inGMT(int year, int month, int day, int hour = 0, int minute = 0) {
-    GregorianDate d;
-    d.year = year;
-    d.month = static_cast<std::int8_t>(month);
-    d.day = static_cast<std::int8_t>(day);
-    d.hour = static_cast<std::int8_t>(hour);
-    d.minute = static_cast<std::int8_t>(minute);
-    return d.getAbsoluteTimeInGMT();
-}
 
 const double kWinter = inGMT(2005, 1, 15);
 const double kSummer = inGMT(2005, 7, 15);
@@ -77,6 +69,12 @@ INSTANTIATE_TEST_SUITE_P(East, TimeZoneName,
                                          Ahead{"CADT", 630, 630}, Ahead{"EAST", 600, 600},
                                          Ahead{"EADT", 660, 660}, Ahead{"NZST", 720, 720},
                                          Ahead{"NZDT", 780, 780}));
+
+INSTANTIATE_TEST_SUITE_P(WithHours, TimeZoneName,
+                         testing::Values(Ahead{"AST4", -240, -240}, Ahead{"EST5", -300, -300},
+                                         Ahead{"CST6", -360, -360}, Ahead{"MST7", -420, -420},
+                                         Ahead{"PST8", -480, -480}, Ahead{"YST9", -540, -540},
+                                         Ahead{"HST10", -600, -600}));
 
 INSTANTIATE_TEST_SUITE_P(Rules, TimeZoneName,
                          testing::Values(Ahead{"AST4ADT", -240, -180}, Ahead{"EST5EDT", -300, -240},
