@@ -21,7 +21,8 @@ namespace {
 using MutableTableChanges = MutableDictionaryOf<String, Number>;
 
 Returner<MutableTableChanges> describeTable(const std::unordered_map<RowID, int>& rows) {
-    const std::map<RowID, int> ordered(rows.begin(), rows.end());
+    std::vector<std::pair<RowID, int>> ordered(rows.begin(), rows.end());
+    std::sort(ordered.begin(), ordered.end());
     Ref<MutableTableChanges> made{MutableTableChanges::dictionary()};
     // Three values stand for all rows.
     std::map<int, Ref<Number>> numbers;

@@ -132,7 +132,9 @@ void Database::open(const char* path, bool writeable) {
 
 void Database::openConnection(const char* path) {
     // A file that vanishes just now must not be made again by a reader.
-    const int flags = SQLITE_OPEN_READWRITE | (mWriteable || !path ? SQLITE_OPEN_CREATE : 0);
+    // One thread uses the connection, so it needs no lock around each of its calls.
+    const int flags = SQLITE_OPEN_READWRITE | SQLITE_OPEN_NOMUTEX |
+                      (mWriteable || !path ? SQLITE_OPEN_CREATE : 0);
     check(sqlite3_open_v2(path ? path : ":memory:", &mDB, flags, nullptr));
     mOpen = true;
     mTransactionDepth = 0;

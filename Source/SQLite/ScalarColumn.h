@@ -5,12 +5,12 @@
 #include "Foundation/Ref.h"
 #include "Foundation/String.h"
 #include "Foundation/TimeZone.h"
-#include "Foundation/URL.h"
 #include "SQLite/Column.h"
 #include "SQLite/ColumnList.h"
 #include "SQLite/Cursor.h"
 #include "SQLite/Query.h"
 #include "SQLite/Row.h"
+#include "SQLite/StoredURL.h"
 
 #include <type_traits>
 
@@ -28,8 +28,6 @@ struct ScalarValue {
     static Stored read(const Cursor& cursor, int column) {
         if constexpr (std::is_same_v<T, Foundation::String>) {
             return cursor.stringColumn(column);
-        } else if constexpr (std::is_same_v<T, Foundation::URL>) {
-            return cursor.urlColumn(column);
         } else if constexpr (std::is_same_v<T, Foundation::Date>) {
             return cursor.dateColumn(column);
         } else if constexpr (std::is_same_v<T, Foundation::Data>) {
@@ -37,6 +35,19 @@ struct ScalarValue {
         } else {
             return cursor.timeZoneColumn(column);
         }
+    }
+};
+
+template <>
+struct ScalarValue<Foundation::URL> {
+    using Stored = StoredURL;
+    using Argument = Foundation::URL*;
+    static Foundation::URL* get(const Stored& stored) { return stored.get(); }
+    static bool isEqual(const Stored& stored, Foundation::URL* value) {
+        return Foundation::IsEqual(stored.get(), value);
+    }
+    static Stored read(const Cursor& cursor, int column) {
+        return Stored(cursor.stringColumn(column));
     }
 };
 

@@ -127,6 +127,7 @@ TEST_F(RowTest, KeepsEachKindOfValue) {
     EXPECT_EQ(item->mBig.getValue(), 1LL << 40);
     EXPECT_EQ(item->mReal.getValue(), 0.25);
     EXPECT_EQ(item->mURL.getValue()->text(), "http://example.org/");
+    EXPECT_EQ(item->mURL.getValue(), item->mURL.getValue());
     EXPECT_EQ(item->mDate.getValue()->getAbsoluteTime(), 1000.5);
     EXPECT_EQ(item->mBytes.getValue()->view(), "xyz");
     EXPECT_EQ(item->mZone.getValue()->getSecondsFromGMT(0), 3600);
