@@ -37,13 +37,22 @@ bool isLoggingOn() {
     return sIsOn;
 }
 
-bool isFacilityOn(const char* name) {
+bool askWhetherOn(const char* name) {
     const AskingPreferences asking;
     if (!isLoggingOn()) return false;
     if (!name) return true;
     char key[100];
     std::snprintf(key, sizeof key, "OVLog%s", name);
     return GetBoolPref(key, false);
+}
+
+/// Off as well where the preferences cannot be asked: no line of the log may fail its caller.
+bool isFacilityOn(const char* name) noexcept {
+    try {
+        return askWhetherOn(name);
+    } catch (...) {
+        return false;
+    }
 }
 
 bool decideOnSystemLog() {

@@ -54,10 +54,12 @@ std::int64_t Utils::str2longlong(const char* text) {
 
 void Utils::printStack(int skip, int count) {
     if (!Foundation::GetBoolPref("OVPrintStack", false)) return;
-    const int first = skip + 1;  // this function's own frame
-    std::vector<void*> addresses(static_cast<std::size_t>(first + count + 1));
+    constexpr int kSlack = 4;  // frames of the stack service itself, which a sanitizer wraps
+    std::vector<void*> addresses(static_cast<std::size_t>(kSlack + skip + 1 + count + 1));
     const int found = backtrace(addresses.data(), static_cast<int>(addresses.size()));
     addresses.resize(static_cast<std::size_t>(found));
+    const auto caller = std::find(addresses.begin(), addresses.end(), __builtin_return_address(0));
+    const int first = static_cast<int>(caller - addresses.begin()) + skip;
     for (void*& address : addresses) {
         // The call itself: behind one that does not return, the next function may begin.
         address = static_cast<char*>(address) - 1;

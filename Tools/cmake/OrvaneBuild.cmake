@@ -40,3 +40,8 @@ if(ORVANE_SANITIZERS)
     target_compile_options(orvane_options INTERFACE ${sanitizers})
     target_link_options(orvane_options INTERFACE ${sanitizers})
 endif()
+
+if(ORVANE_FUZZERS)
+    # Tells the fuzzer which branches of the library an input reached.
+    target_compile_options(orvane_options INTERFACE -fsanitize=fuzzer-no-link)
+endif()
