@@ -101,9 +101,10 @@ void Database::_receiveChangeNotification(Notification* notification) {
 }
 
 void Database::tellTables(const Dictionary* changes) {
-    for (const auto& [name, value] : *changes) {
+    for (const auto& entry : *changes) {
         Foundation::callGuarded(
             "void SQLite::Database::_receiveChangeNotification(Foundation::Notification *)", [&] {
+                const auto& [name, value] = entry;
                 auto* text = dynamic_cast<String*>(name);
                 auto* rows = dynamic_cast<Dictionary*>(value);
                 Table* table = text && rows ? getRegisteredTable(text->utf8().c_str()) : nullptr;

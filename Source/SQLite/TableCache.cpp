@@ -143,9 +143,10 @@ void Table::_applyChangeNotification(const Dictionary* changes, bool unloadUpdat
         const std::int64_t action = Number::getInteger(dynamic_cast<const Number*>(value));
         const bool isUpdate = action == ChangeAction::kUpdate && unloadUpdated;
         if (action != ChangeAction::kDelete && !isUpdate) continue;
+        const auto* rowID = dynamic_cast<const String*>(key);
         Foundation::callGuarded(
             "void SQLite::Table::_applyChangeNotification(Database::TableChangeDict *, bool)",
-            [&] { applyChange(dynamic_cast<const String*>(key), action, unloadUpdated); });
+            [&] { applyChange(rowID, action, unloadUpdated); });
     }
 }
 
