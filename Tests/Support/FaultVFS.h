@@ -9,7 +9,8 @@ namespace Support {
 /// file system of new connections while it lives; connections must be closed before it ends.
 ///
 /// Calls are counted by kind. `failAt` plans a failure; the call that meets it does nothing but
-/// give the code, except that a short read gives half of what was asked for.
+/// give the code, except that a short read gives half of what was asked for. A sync does nothing
+/// else either, and a sleep of SQLite's own takes no time.
 class FaultVFS {
  public:
     enum class Call { Read, Write, Sync, Truncate, Open, Lock };

@@ -49,7 +49,7 @@ PipedChild::PipedChild(const std::vector<std::string>& command) {
 
 PipedChild::~PipedChild() {
     if (mPID <= 0) return;
-    kill(mPID, SIGKILL);
+    kill();
     wait();
 }
 
@@ -63,6 +63,10 @@ std::string PipedChild::readLine() {
 
 void PipedChild::closeInput() {
     mInput.close();
+}
+
+void PipedChild::kill() {
+    ::kill(mPID, SIGKILL);
 }
 
 int PipedChild::wait() {

@@ -24,6 +24,8 @@ class PipedChild {
     std::string readLine();
     /// Ends its input.
     void closeInput();
+    /// Ends it with SIGKILL. What it has written can still be read.
+    void kill();
     /// Waits for its end. Gives its exit status; -1 if a signal ended it.
     int wait();
 
