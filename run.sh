@@ -3,7 +3,7 @@
 set -eu
 cd "$(dirname "$0")"
 
-Tools/install_packages build run
+Tools/install_packages build run bench
 
 cmake --preset release -DBUILD_TESTING=OFF
 cmake --build --preset release

@@ -3,7 +3,7 @@
 set -eu
 cd "$(dirname "$0")"
 
-Tools/install_packages build run test
+Tools/install_packages build run bench test
 
 cmake --preset debug
 cmake --build --preset debug
