@@ -1,0 +1,60 @@
+#pragma once
+
+#include "Model/CoreOf.h"
+#include "SQLite/ScalarColumn.h"
+#include "SQLite/ToOneColumn.h"
+
+namespace Orvane {
+
+class ClientCore;
+class FeedCore;
+
+/// A client's link to a feed, with its settings for it: a row of "Subscriptions". The one without a
+/// feed has the client's defaults, which a 0 elsewhere stands for.
+class SubscriptionCore : public CoreOf<SubscriptionCore> {
+ public:
+    static constexpr const char* kTableName = "Subscriptions";
+    static constexpr bool kCacheAllRows = true;
+    static constexpr bool kRetainRows = true;
+    static const char kSchema[];
+    static const SQLite::Table::IndexSpec kSchemaIndexes[];
+    static const SQLite::Table::TriggerSpec kSchemaTriggers[];
+
+    /// The positions of the columns, behind "rowID".
+    enum ColumnID : int {
+        Client = 0,
+        Feed,
+        RefreshInterval,
+        ExpirationInterval,
+        ExpirationDate,
+        RefreshesInBackground,
+        DownloadsEnclosures,
+        MaxEnclosureSize,
+        EnclosureTypesString,
+        UnreadCount,
+    };
+
+    explicit SubscriptionCore(SQLite::Table* table = nullptr) : CoreOf(table) {}
+    SubscriptionCore(SQLite::Table* table, SQLite::RowID rowID) : CoreOf(table, rowID) {}
+
+    /// The columns in the order of the table.
+    static const SQLite::ColumnList& columnList();
+
+    OVObject* createOVObject() override;
+
+    SQLite::ToOneColumn<ClientCore, true> mClient{this};     ///< the owner
+    SQLite::ToOneColumn<FeedCore, true> mFeed{this};         ///< none in the settings row
+    SQLite::ScalarColumn<double> mRefreshInterval{this};     ///< seconds; below 0 never
+    SQLite::ScalarColumn<double> mExpirationInterval{this};  ///< seconds; below 0 never
+    /// Entries created before it do not count.
+    SQLite::ScalarColumn<Foundation::Date> mExpirationDate{this};
+    /// Even while the client does not run.
+    SQLite::ScalarColumn<bool> mRefreshesInBackground{this};
+    SQLite::ScalarColumn<bool> mDownloadsEnclosures{this};
+    SQLite::ScalarColumn<double> mMaxEnclosureSize{this};  ///< bytes
+    /// MIME types, joined by a tab.
+    SQLite::ScalarColumn<Foundation::String> mEnclosureTypesString{this};
+    SQLite::ScalarColumn<int> mUnreadCount{this};  ///< a cache
+};
+
+}  // namespace Orvane
