@@ -10,6 +10,6 @@ cmake --build --preset debug
 
 cmake --preset fuzz
 cmake --build --preset fuzz --target fuzzers
-ctest --preset fuzz --parallel 2
+Tools/run_tests fuzz
 
-ctest --preset debug --parallel 2 "$@"
+Tools/run_tests debug "$@"
