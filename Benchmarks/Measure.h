@@ -30,10 +30,16 @@ struct Comparison {
     double ratio() const { return measured / floor; }
 };
 
-template <class Measured, class Floor>
-Comparison compare(Measured&& measured, Floor&& floor, int rounds = 15) {
+struct Nothing {
+    void operator()() const {}
+};
+
+/// `prepare` is done before each round, and not measured.
+template <class Measured, class Floor, class Prepare = Nothing>
+Comparison compare(Measured&& measured, Floor&& floor, int rounds = 15, Prepare&& prepare = {}) {
     std::vector<double> a, b;
     for (int i = 0; i < rounds; ++i) {
+        prepare();
         a.push_back(secondsOf(measured));
         b.push_back(secondsOf(floor));
     }
