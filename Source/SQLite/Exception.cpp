@@ -67,14 +67,14 @@ Exception::Exception(int code, const char* message, const char* sql)
     : mCode(code),
       mMessage(SQLText::format("%s[%d.%d]: %s in \"%s\"", errorCodeAsString(code), code & 127,
                                code >> 8, message, sql)) {
-    Foundation::gWarn.log("SQL Error: %s", what());
+    Foundation::gWarn.log("SQL Error: %s", mMessage.c_str());
 }
 
 Exception::Exception(int code, const char* message)
     : mCode(code),
       mMessage(SQLText::format("%s[%d.%d]: %s", errorCodeAsString(code), code & 127, code >> 8,
                                message)) {
-    Foundation::gWarn.log("SQL Error: %s", what());
+    Foundation::gWarn.log("SQL Error: %s", mMessage.c_str());
 }
 
 bool Exception::isFatal() const {
