@@ -7,6 +7,7 @@
 #include <sqlite3.h>
 
 #include <algorithm>
+#include <array>
 #include <exception>
 #include <filesystem>
 
@@ -156,13 +157,15 @@ void FaultScenario::reopen() {
 }
 
 std::string FaultScenario::run(std::size_t steps) {
-    constexpr void (FaultScenario::*kAll[kSteps])() = {
-        &FaultScenario::open, &FaultScenario::readRows, &FaultScenario::changeRows,
-        &FaultScenario::vacuum, &FaultScenario::changeAndClose};
+    using Step = void (FaultScenario::*)();
+    constexpr std::array<Step, kSteps> kAll = {&FaultScenario::open, &FaultScenario::readRows,
+                                               &FaultScenario::changeRows, &FaultScenario::vacuum,
+                                               &FaultScenario::changeAndClose};
     try {
         for (; mNextStep < steps; ++mNextStep) {
             const AutoreleasePool pool;
-            (this->*kAll[mNextStep])();
+            const Step step = kAll.at(mNextStep);
+            (this->*step)();
         }
     } catch (const std::exception& exception) {
         return exception.what();
