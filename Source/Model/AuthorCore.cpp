@@ -10,12 +10,6 @@ const char AuthorCore::kSchema[] =
     "rowID integer not null unique primary key, name text, email text, url text, "
     "contactBookUid text";
 
-const SQLite::Table::IndexSpec AuthorCore::kSchemaIndexes[] = {
-    {nullptr, nullptr},
-};
-
-const SQLite::Table::TriggerSpec AuthorCore::kSchemaTriggers[] = {{nullptr, nullptr, nullptr}};
-
 const SQLite::ColumnList& AuthorCore::columnList() {
     static const SQLite::ColumnList sColumns = {
         column<&AuthorCore::mName>("name"),

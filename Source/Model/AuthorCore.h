@@ -9,11 +9,7 @@ namespace Orvane {
 class AuthorCore : public CoreOf<AuthorCore> {
  public:
     static constexpr const char* kTableName = "Authors";
-    static constexpr bool kCacheAllRows = true;
-    static constexpr bool kRetainRows = false;
     static const char kSchema[];
-    static const SQLite::Table::IndexSpec kSchemaIndexes[];
-    static const SQLite::Table::TriggerSpec kSchemaTriggers[];
 
     /// The positions of the columns, behind "rowID".
     enum ColumnID : int {
@@ -23,8 +19,7 @@ class AuthorCore : public CoreOf<AuthorCore> {
         ContactBookUID,
     };
 
-    explicit AuthorCore(SQLite::Table* table = nullptr) : CoreOf(table) {}
-    AuthorCore(SQLite::Table* table, SQLite::RowID rowID) : CoreOf(table, rowID) {}
+    using CoreOf::CoreOf;
 
     /// The columns in the order of the table.
     static const SQLite::ColumnList& columnList();

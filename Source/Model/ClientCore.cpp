@@ -16,8 +16,6 @@ const SQLite::Table::IndexSpec ClientCore::kSchemaIndexes[] = {
     {nullptr, nullptr},
 };
 
-const SQLite::Table::TriggerSpec ClientCore::kSchemaTriggers[] = {{nullptr, nullptr, nullptr}};
-
 const SQLite::ColumnList& ClientCore::columnList() {
     static const SQLite::ColumnList sColumns = {
         column<&ClientCore::mSignature>("signature"),

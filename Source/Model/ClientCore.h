@@ -12,11 +12,9 @@ class SubscriptionCore;
 class ClientCore : public CoreOf<ClientCore> {
  public:
     static constexpr const char* kTableName = "Clients";
-    static constexpr bool kCacheAllRows = true;
     static constexpr bool kRetainRows = true;
     static const char kSchema[];
     static const SQLite::Table::IndexSpec kSchemaIndexes[];
-    static const SQLite::Table::TriggerSpec kSchemaTriggers[];
 
     /// The positions of the columns, behind "rowID".
     enum ColumnID : int {
@@ -25,8 +23,7 @@ class ClientCore : public CoreOf<ClientCore> {
         DateUsed,
     };
 
-    explicit ClientCore(SQLite::Table* table = nullptr) : CoreOf(table) {}
-    ClientCore(SQLite::Table* table, SQLite::RowID rowID) : CoreOf(table, rowID) {}
+    using CoreOf::CoreOf;
 
     /// The columns in the order of the table.
     static const SQLite::ColumnList& columnList();

@@ -9,12 +9,6 @@ using SQLite::column;
 const char ContentCore::kSchema[] =
     "rowID integer not null unique primary key, data blob, mimeType text";
 
-const SQLite::Table::IndexSpec ContentCore::kSchemaIndexes[] = {
-    {nullptr, nullptr},
-};
-
-const SQLite::Table::TriggerSpec ContentCore::kSchemaTriggers[] = {{nullptr, nullptr, nullptr}};
-
 const SQLite::ColumnList& ContentCore::columnList() {
     static const SQLite::ColumnList sColumns = {
         column<&ContentCore::mData>("data"),

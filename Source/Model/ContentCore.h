@@ -9,11 +9,7 @@ namespace Orvane {
 class ContentCore : public CoreOf<ContentCore> {
  public:
     static constexpr const char* kTableName = "Contents";
-    static constexpr bool kCacheAllRows = true;
-    static constexpr bool kRetainRows = false;
     static const char kSchema[];
-    static const SQLite::Table::IndexSpec kSchemaIndexes[];
-    static const SQLite::Table::TriggerSpec kSchemaTriggers[];
 
     /// The positions of the columns, behind "rowID".
     enum ColumnID : int {
@@ -21,8 +17,7 @@ class ContentCore : public CoreOf<ContentCore> {
         MIMEType,
     };
 
-    explicit ContentCore(SQLite::Table* table = nullptr) : CoreOf(table) {}
-    ContentCore(SQLite::Table* table, SQLite::RowID rowID) : CoreOf(table, rowID) {}
+    using CoreOf::CoreOf;
 
     /// The columns in the order of the table.
     static const SQLite::ColumnList& columnList();

@@ -19,8 +19,6 @@ const SQLite::Table::IndexSpec EnclosureCore::kSchemaIndexes[] = {
     {nullptr, nullptr},
 };
 
-const SQLite::Table::TriggerSpec EnclosureCore::kSchemaTriggers[] = {{nullptr, nullptr, nullptr}};
-
 const SQLite::ColumnList& EnclosureCore::columnList() {
     static const SQLite::ColumnList sColumns = {
         column<&EnclosureCore::mEntry>("entry"),

@@ -12,11 +12,8 @@ class EntryCore;
 class EnclosureCore : public CoreOf<EnclosureCore> {
  public:
     static constexpr const char* kTableName = "Enclosures";
-    static constexpr bool kCacheAllRows = true;
-    static constexpr bool kRetainRows = false;
     static const char kSchema[];
     static const SQLite::Table::IndexSpec kSchemaIndexes[];
-    static const SQLite::Table::TriggerSpec kSchemaTriggers[];
 
     /// The positions of the columns, behind "rowID".
     enum ColumnID : int {
@@ -32,8 +29,7 @@ class EnclosureCore : public CoreOf<EnclosureCore> {
         DownloadErrorCode,
     };
 
-    explicit EnclosureCore(SQLite::Table* table = nullptr) : CoreOf(table) {}
-    EnclosureCore(SQLite::Table* table, SQLite::RowID rowID) : CoreOf(table, rowID) {}
+    using CoreOf::CoreOf;
 
     /// The columns in the order of the table.
     static const SQLite::ColumnList& columnList();

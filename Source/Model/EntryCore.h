@@ -16,8 +16,6 @@ class FeedCore;
 class EntryCore : public CoreOf<EntryCore> {
  public:
     static constexpr const char* kTableName = "Entries";
-    static constexpr bool kCacheAllRows = true;
-    static constexpr bool kRetainRows = false;
     static const char kSchema[];
     static const SQLite::Table::IndexSpec kSchemaIndexes[];
     static const SQLite::Table::TriggerSpec kSchemaTriggers[];
@@ -54,8 +52,7 @@ class EntryCore : public CoreOf<EntryCore> {
         LocalDateFlagsUpdated,
     };
 
-    explicit EntryCore(SQLite::Table* table = nullptr) : CoreOf(table) {}
-    EntryCore(SQLite::Table* table, SQLite::RowID rowID) : CoreOf(table, rowID) {}
+    using CoreOf::CoreOf;
 
     /// The columns in the order of the table.
     static const SQLite::ColumnList& columnList();

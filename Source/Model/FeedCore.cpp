@@ -24,8 +24,6 @@ const SQLite::Table::IndexSpec FeedCore::kSchemaIndexes[] = {
     {nullptr, nullptr},
 };
 
-const SQLite::Table::TriggerSpec FeedCore::kSchemaTriggers[] = {{nullptr, nullptr, nullptr}};
-
 const SQLite::ColumnList& FeedCore::columnList() {
     static const SQLite::ColumnList sColumns = {
         column<&FeedCore::mIdentifier>("identifier"),

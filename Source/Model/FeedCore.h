@@ -13,11 +13,9 @@ class SubscriptionCore;
 class FeedCore : public CoreOf<FeedCore> {
  public:
     static constexpr const char* kTableName = "Feeds";
-    static constexpr bool kCacheAllRows = true;
     static constexpr bool kRetainRows = true;
     static const char kSchema[];
     static const SQLite::Table::IndexSpec kSchemaIndexes[];
-    static const SQLite::Table::TriggerSpec kSchemaTriggers[];
 
     /// The positions of the columns, behind "rowID".
     enum ColumnID : int {
@@ -51,8 +49,7 @@ class FeedCore : public CoreOf<FeedCore> {
         LocalDateCreatedOfNewestEntry,
     };
 
-    explicit FeedCore(SQLite::Table* table = nullptr) : CoreOf(table) {}
-    FeedCore(SQLite::Table* table, SQLite::RowID rowID) : CoreOf(table, rowID) {}
+    using CoreOf::CoreOf;
 
     /// The columns in the order of the table.
     static const SQLite::ColumnList& columnList();

@@ -21,7 +21,7 @@ void createTable() {
 
 }  // namespace
 
-void Schema::createDatabase() {
+void Schema::createDatabase(const std::function<void()>& restore) {
     SQLite::Database* database = SQLite::gDatabase;
     OV_ASSERT(database != nullptr);
     // Can only be chosen while the file is empty.
@@ -30,6 +30,7 @@ void Schema::createDatabase() {
         const SQLite::Transaction transaction(true);
         database->setUserVersion(kVersion);
         createTables();
+        if (restore) restore();
     }
     // Not before, as it fixes the mode of auto_vacuum.
     database->useWriteAheadLog();

@@ -1,5 +1,7 @@
 #pragma once
 
+#include <functional>
+
 namespace Orvane {
 
 /// The tables of the model in the database of the process.
@@ -11,8 +13,9 @@ class Schema {
     static constexpr int kVersion = kMajorVersion * 10000 + kMinorVersion;
 
     /// Makes a new database of an empty file that is open for writing, all of it or nothing. Throws
-    /// `Exception`.
-    static void createDatabase();
+    /// `Exception`, and what `restore` throws: that is called once the tables are there, within the
+    /// same transaction, and fills them from what else there is of an earlier database.
+    static void createDatabase(const std::function<void()>& restore = nullptr);
     /// Makes the tables that are missing, with their indexes and triggers.
     static void createTables();
 };

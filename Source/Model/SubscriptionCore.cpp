@@ -21,9 +21,6 @@ const SQLite::Table::IndexSpec SubscriptionCore::kSchemaIndexes[] = {
     {nullptr, nullptr},
 };
 
-const SQLite::Table::TriggerSpec SubscriptionCore::kSchemaTriggers[] = {
-    {nullptr, nullptr, nullptr}};
-
 const SQLite::ColumnList& SubscriptionCore::columnList() {
     static const SQLite::ColumnList sColumns = {
         column<&SubscriptionCore::mClient>("client"),

@@ -14,11 +14,9 @@ class FeedCore;
 class SubscriptionCore : public CoreOf<SubscriptionCore> {
  public:
     static constexpr const char* kTableName = "Subscriptions";
-    static constexpr bool kCacheAllRows = true;
     static constexpr bool kRetainRows = true;
     static const char kSchema[];
     static const SQLite::Table::IndexSpec kSchemaIndexes[];
-    static const SQLite::Table::TriggerSpec kSchemaTriggers[];
 
     /// The positions of the columns, behind "rowID".
     enum ColumnID : int {
@@ -34,8 +32,7 @@ class SubscriptionCore : public CoreOf<SubscriptionCore> {
         UnreadCount,
     };
 
-    explicit SubscriptionCore(SQLite::Table* table = nullptr) : CoreOf(table) {}
-    SubscriptionCore(SQLite::Table* table, SQLite::RowID rowID) : CoreOf(table, rowID) {}
+    using CoreOf::CoreOf;
 
     /// The columns in the order of the table.
     static const SQLite::ColumnList& columnList();

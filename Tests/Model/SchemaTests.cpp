@@ -7,6 +7,8 @@
 
 #include <gmock/gmock.h>
 
+#include <stdexcept>
+
 using namespace Foundation;
 using namespace Orvane;
 using namespace SQLite;
@@ -231,4 +233,27 @@ TEST_F(SchemaOfEmptyFileTest, IsMadeWholeOrNotAtAll) {
     Schema::createDatabase();
     EXPECT_EQ(db().getUserVersion(), 10022);
     EXPECT_EQ(count("Contents"), 0);
+}
+
+TEST_F(SchemaOfEmptyFileTest, IsFilledInTheTransactionThatMakesIt) {
+    Schema::createDatabase([] {
+        EXPECT_EQ(db().getTransactionDepth(), 1);
+        EXPECT_EQ(db().getUserVersion(), 10022);
+        db().execute("insert into Authors (name) values ('A')");
+    });
+    EXPECT_FALSE(db().isInTransaction());
+    EXPECT_EQ(count("Authors"), 1);
+    EXPECT_EQ(db().execScalar("PRAGMA auto_vacuum"), 2);
+}
+
+TEST_F(SchemaOfEmptyFileTest, IsNotMadeIfItCannotBeFilled) {
+    const Support::LogCapture quiet;
+    const auto restore = [] {
+        db().execute("insert into Authors (name) values ('A')");
+        throw std::runtime_error("no such luck");
+    };
+    EXPECT_THROW(Schema::createDatabase(restore), std::runtime_error);
+    EXPECT_FALSE(db().isInTransaction());
+    EXPECT_EQ(db().getUserVersion(), 0);
+    EXPECT_EQ(count("sqlite_master"), 0);
 }
