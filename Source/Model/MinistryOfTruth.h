@@ -1,0 +1,49 @@
+#pragma once
+
+#include "Foundation/Timer.h"
+#include "Foundation/URL.h"
+#include "Foundation/Uncopyable.h"
+
+namespace Orvane {
+
+class FeedCore;
+
+/// The agent's view of the database on the disk: where its files are, how one that is there is
+/// opened and brought up to date, and how one that is broken or too old is moved out of the way and
+/// made anew. What is needed for that stands outside of it: the file of clients and subscriptions,
+/// and the documents and old entries of the feeds, the "truth".
+///
+/// Only the agent uses it, on its main thread.
+class MinistryOfTruth : Foundation::Uncopyable {
+ public:
+    using URL = Foundation::URL;
+
+    static constexpr double kSaveDelaySeconds = 5.0;
+
+    /// Made on first use, and destroyed at the process's end.
+    static MinistryOfTruth* instance();
+
+    /// Saves the file of clients and subscriptions in 5 seconds, or when an earlier request said.
+    void saveSubscriptionsSoon();
+    /// Saves it now. That it cannot be written draws a warning. Throws `SQLite::Exception`.
+    void saveSubscriptions();
+    static Foundation::URLReturner getClientPListURL();
+
+    /// Takes the directory with the feed's saved entries away at once and deletes it on the thread
+    /// of `FileDeletionQueue`, so that no transaction waits for a big one, and a feed that is added
+    /// again finds none. `directory` may be null: there is none then.
+    void deleteTruthDirectoryForFeed(FeedCore* feed, URL* directory);
+
+    /// Whether a new database is being filled with what there was in an earlier one. The documents
+    /// that arrive then come from the truth and are not written to it, and unread entries are not
+    /// counted.
+    bool isRestoring() const { return mRestoring; }
+
+ private:
+    MinistryOfTruth();
+
+    bool mRestoring = false;
+    Foundation::Timer<MinistryOfTruth> mSaveTimer;
+};
+
+}  // namespace Orvane

@@ -1,0 +1,82 @@
+#include "Model/MinistryOfTruth.h"
+
+#include "Model/StorageTest.h"
+#include "Support/TurnUntil.h"
+#include "Utilities/FileUtils.h"
+
+#include <gmock/gmock.h>
+
+using namespace Foundation;
+using namespace Orvane;
+
+namespace {
+
+/// With a new database in memory.
+class SavingTest : public StorageTest {
+ protected:
+    SavingTest() { makeInMemory(); }
+
+    Support::LoggingOn logging{{&SQLite::gLogTruth}};
+};
+
+class TruthDirectoryTest : public StorageTest {
+ protected:
+    static void waitUntilDeleted() {
+        // The queue opens a pool for a warning, which waits for the test's.
+        ASSERT_TRUE(Support::turnUntil([] { return !FileUtils::isDeletingFilesAsynchronously(); }));
+    }
+};
+
+}  // namespace
+
+TEST_F(SavingTest, SavesOnceFiveSecondsAfterTheFirstRequest) {
+    ministry().saveSubscriptionsSoon();
+    clock.advanceBy(3);
+    ministry().saveSubscriptionsSoon();
+    EXPECT_FALSE(has("Clients.plist"));
+    clock.advanceBy(1.9);
+    EXPECT_FALSE(has("Clients.plist"));
+    clock.advanceBy(0.2);
+    EXPECT_TRUE(has("Clients.plist"));
+    clock.advanceBy(60);
+    EXPECT_EQ(log.count("[Truth] Will save client/subscription info plist in 5 sec..."), 1);
+    EXPECT_EQ(log.count("[Truth] Saving client/subscription info plist"), 1);
+}
+
+TEST_F(SavingTest, ASaveTakesTheLaterOnesPlace) {
+    ministry().saveSubscriptionsSoon();
+    ministry().saveSubscriptions();
+    clock.advanceBy(60);
+    EXPECT_EQ(log.count("Saving client/subscription info plist"), 1);
+    ministry().saveSubscriptionsSoon();
+    clock.advanceBy(60);
+    EXPECT_EQ(log.count("Saving client/subscription info plist"), 2);
+}
+
+TEST_F(TruthDirectoryTest, IsTakenAwayAtOnceAndDeleted) {
+    writeFile("Feeds/abc/1.xml", "<item/>");
+    writeFile("Feeds/abcd/1.xml", "<item/>");
+    URL* directory = urlOf("Feeds/abc", true);
+    ministry().deleteTruthDirectoryForFeed(nullptr, directory);
+    EXPECT_FALSE(has("Feeds/abc"));
+    waitUntilDeleted();
+    EXPECT_FALSE(has("Feeds/abc.deleted.at.788918400.000000"));
+    EXPECT_TRUE(has("Feeds/abcd/1.xml"));
+}
+
+TEST_F(TruthDirectoryTest, HasTheTimeInTheNameThatItIsDeletedUnder) {
+    writeFile("Feeds/abc/1.xml", "<item/>");
+    // Taken already: the rename fails, and tells by which name.
+    writeFile("Feeds/abc.deleted.at.788918400.000000/1.xml", "<item/>");
+    URL* directory = urlOf("Feeds/abc", true);
+    ministry().deleteTruthDirectoryForFeed(nullptr, directory);
+    EXPECT_TRUE(has("Feeds/abc/1.xml"));
+    EXPECT_EQ(log.count("Could not take the directory file://"), 1);
+    EXPECT_FALSE(FileUtils::isDeletingFilesAsynchronously());
+}
+
+TEST_F(TruthDirectoryTest, MayBeNone) {
+    ministry().deleteTruthDirectoryForFeed(nullptr, nullptr);
+    EXPECT_FALSE(FileUtils::isDeletingFilesAsynchronously());
+    EXPECT_TRUE(log.lines().empty());
+}
