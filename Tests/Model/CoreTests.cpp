@@ -1,15 +1,16 @@
 #include "Model/Core.h"
 
-#include "Foundation/AssertionFailure.h"
 #include "Foundation/Logger.h"
 #include "Foundation/NetException.h"
 #include "Model/DeclaredColumns.h"
 #include "Model/ModelTest.h"
 #include "Model/PublicObjects.h"
+#include "Support/AssertionOf.h"
 
 using namespace Foundation;
 using namespace Orvane;
 using namespace SQLite;
+using Support::assertionOf;
 using Support::LogCapture;
 using Support::LoggingOn;
 
@@ -51,16 +52,6 @@ class CoreTest : public ModelTest {
     template <class T>
     static Ref<T> row() {
         return Returner<T>::adopted(new T);
-    }
-    /// What an `AssertionFailure` says.
-    template <class F>
-    static std::string failureOf(F f) {
-        try {
-            f();
-        } catch (const AssertionFailure& failure) {
-            return failure.what();
-        }
-        return "none";
     }
     /// Which of the port's operations makes the object of a class.
     template <class T>
@@ -107,8 +98,8 @@ TEST_F(CoreTest, ThrowsForARowThatIsGone) {
 }
 
 TEST_F(CoreTest, RefusesIDsThatNoRowCanHave) {
-    EXPECT_EQ(failureOf([] { AuthorCore::getRow(0); }), "rowID>0");
-    EXPECT_EQ(failureOf([] { AuthorCore::getRow(-1); }), "rowID>0");
+    EXPECT_EQ(assertionOf([] { AuthorCore::getRow(0); }), "rowID>0");
+    EXPECT_EQ(assertionOf([] { AuthorCore::getRow(-1); }), "rowID>0");
 }
 
 TEST_F(CoreTest, ANullRowHasNoPublicObject) {
@@ -136,12 +127,12 @@ TEST_F(CoreTest, EachClassHasAPublicObjectOfItsOwnKind) {
 TEST_F(CoreTest, AssertsThatThePublicObjectCouldBeMade) {
     const Ref<AuthorCore> author = row<AuthorCore>();
     objects.fails = true;
-    EXPECT_EQ(failureOf([&] { Core::getOVObject(author.get()); }), "mOVObject");
+    EXPECT_EQ(assertionOf([&] { Core::getOVObject(author.get()); }), "mOVObject");
     const Ref<FeedCore> feed = row<FeedCore>();
     objects.fails = false;
-    EXPECT_EQ(failureOf([&] { Core::getOVObject(feed.get()); }), "mOVObject");
+    EXPECT_EQ(assertionOf([&] { Core::getOVObject(feed.get()); }), "mOVObject");
     PublicObjects::setCurrent(nullptr);
-    EXPECT_EQ(failureOf([&] { Core::getOVObject(author.get()); }), "mOVObject");
+    EXPECT_EQ(assertionOf([&] { Core::getOVObject(author.get()); }), "mOVObject");
 }
 
 TEST_F(CoreTest, DoesNotReplaceAPublicObject) {
@@ -150,7 +141,7 @@ TEST_F(CoreTest, DoesNotReplaceAPublicObject) {
     author->setOVObject(&objects.object);
     author->setOVObject(&objects.object);
     EXPECT_EQ(
-        failureOf([&] { author->setOVObject(&other); }),
+        assertionOf([&] { author->setOVObject(&other); }),
         OVFormat("Core::setOVObject: Can't replace %p with %p",
                  static_cast<const void*>(&objects.object), static_cast<const void*>(&other)));
     EXPECT_EQ(Core::getOVObject(author.get()), &objects.object);
@@ -161,7 +152,7 @@ TEST_F(CoreTest, IsLeftOnlyByItsPublicObject) {
     const Ref<AuthorCore> author = row<AuthorCore>();
     OVObject other;
     author->setOVObject(&objects.object);
-    EXPECT_EQ(failureOf([&] { author->clearOVObject(&other); }), "ovObject==mOVObject");
+    EXPECT_EQ(assertionOf([&] { author->clearOVObject(&other); }), "ovObject==mOVObject");
     author->clearOVObject(&objects.object);
     author->setOVObject(&other);
     EXPECT_EQ(Core::getOVObject(author.get()), &other);

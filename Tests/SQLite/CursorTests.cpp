@@ -6,11 +6,13 @@
 #include "SQLite/Statement.h"
 #include "SQLite/StoreTest.h"
 #include "SQLite/Transaction.h"
+#include "Support/AssertionOf.h"
 
 #include <sqlite3.h>
 
 using namespace Foundation;
 using namespace SQLite;
+using Support::assertionOf;
 using Support::LogCapture;
 using Support::LoggingOn;
 
@@ -18,16 +20,6 @@ namespace {
 
 using CursorTest = StoreTest;
 using QueryTest = StoreTest;
-
-template <class Body>
-std::string assertionOf(Body&& body) {
-    try {
-        body();
-    } catch (const AssertionFailure& failure) {
-        return failure.what();
-    }
-    return "none";
-}
 
 /// The value that a text binds as, with its type.
 class BindTest : public StoreTest {

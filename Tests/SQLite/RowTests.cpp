@@ -4,25 +4,17 @@
 #include "Foundation/Logger.h"
 #include "SQLite/Exception.h"
 #include "SQLite/StoreTest.h"
+#include "Support/AssertionOf.h"
 
 using namespace Foundation;
 using namespace SQLite;
+using Support::assertionOf;
 using Support::LogCapture;
 using Support::LoggingOn;
 
 namespace {
 
 using RowTest = StoreTest;
-
-template <class Body>
-std::string assertionOf(Body&& body) {
-    try {
-        body();
-    } catch (const AssertionFailure& failure) {
-        return failure.what();
-    }
-    return "none";
-}
 
 }  // namespace
 

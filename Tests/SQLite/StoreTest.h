@@ -3,6 +3,7 @@
 #include "Foundation/AutoreleasePool.h"
 #include "SQLite/Cursor.h"
 #include "SQLite/Database.h"
+#include "SQLite/Exception.h"
 #include "SQLite/FakeCenter.h"
 #include "SQLite/TestRows.h"
 #include "Support/LogCapture.h"
@@ -13,6 +14,17 @@
 
 #include <memory>
 #include <string>
+
+/// Holds a lock on a file, while it lives, as another process would.
+class Locker : Foundation::Uncopyable {
+ public:
+    /// `sql` takes the lock.
+    Locker(const std::string& path, const char* sql);
+    ~Locker();
+
+ private:
+    sqlite3* mDB = nullptr;
+};
 
 /// A test of the process's database on a file of its own, with the tables of `TestRows`, a clock
 /// that stands still and a distributed centre that only keeps what is posted.
@@ -51,6 +63,16 @@ class StoreTest : public testing::Test {
         return db().execScalar("select count(*) from Items where %s", where);
     }
     static Foundation::String* text(const char* utf8) { return Foundation::String::string(utf8); }
+    /// The code of the `Exception` that `body` throws; 0 if it throws none.
+    template <class Body>
+    static int codeOf(Body&& body) {
+        try {
+            body();
+        } catch (const SQLite::Exception& exception) {
+            return exception.getCode();
+        }
+        return 0;
+    }
     /// What the last commit announced, as the log has it.
     std::string lastChanges() const {
         if (platform.posts.empty()) return "";

@@ -6,9 +6,11 @@
 #include "SQLite/Exception.h"
 #include "SQLite/StoreTest.h"
 #include "SQLite/Transaction.h"
+#include "Support/AssertionOf.h"
 
 using namespace Foundation;
 using namespace SQLite;
+using Support::assertionOf;
 using Support::LogCapture;
 using Support::LoggingOn;
 
@@ -28,16 +30,6 @@ class TableTest : public StoreTest {
                                name);
     }
 };
-
-template <class Body>
-std::string assertionOf(Body&& body) {
-    try {
-        body();
-    } catch (const AssertionFailure& failure) {
-        return failure.what();
-    }
-    return "none";
-}
 
 }  // namespace
 
