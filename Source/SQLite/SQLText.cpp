@@ -10,12 +10,10 @@ namespace SQLite {
 namespace {
 
 char* finish(sqlite3_str* buffer) {
-    char* text = sqlite3_str_length(buffer) > 0 ? nullptr : sqlite3_mprintf("");
-    if (text) {
-        sqlite3_free(sqlite3_str_finish(buffer));
-    } else {
-        text = sqlite3_str_finish(buffer);
-    }
+    const bool isWhole = sqlite3_str_errcode(buffer) == SQLITE_OK;
+    char* text = sqlite3_str_finish(buffer);
+    // Null stands for an empty text too.
+    if (!text && isWhole) text = sqlite3_mprintf("");
     if (!text) throw std::bad_alloc();
     return text;
 }

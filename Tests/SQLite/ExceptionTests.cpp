@@ -3,6 +3,10 @@
 #include "Support/LogCapture.h"
 
 #include <gtest/gtest.h>
+#include <sqlite3.h>
+
+#include <new>
+#include <string>
 
 using SQLite::Exception;
 using SQLite::SQLText;
@@ -108,6 +112,16 @@ TEST(SQLText, FormatsAsSqliteDoes) {
     EXPECT_STREQ(SQLText::format("%.2f %g", 1.5, 0.25).c_str(), "1.50 0.25");
     EXPECT_STREQ(SQLText::format("100%% of %s%%", "it").c_str(), "100% of it%");
     EXPECT_STREQ(SQLText::format("").c_str(), "");
+}
+
+TEST(SQLText, ThrowsWithoutMemory) {
+    const std::string large(1 << 20, 'x');
+    const sqlite3_int64 before =
+        sqlite3_hard_heap_limit64(sqlite3_memory_used() + static_cast<int>(large.size()) / 2);
+    EXPECT_THROW(SQLText(std::string_view(large)), std::bad_alloc);
+    EXPECT_THROW(SQLText::format("%s", large), std::bad_alloc);
+    sqlite3_hard_heap_limit64(before);
+    EXPECT_EQ(std::string_view(SQLText::format("%s", large).c_str()), large);
 }
 
 TEST(SQLText, TakesAWholeTextAsItStands) {
