@@ -67,6 +67,7 @@ bool Cursor::nextRow() {
 
 void Cursor::failStep(int result) {
     Database* database = mQuery->getDatabase();
+    mStatement->reset();
     gLogSQL.log("  step %p [%i] -- ERROR %i", mStatement->getAddress(), mRowIndex, result);
     const Exception exception(result, sqlite3_errmsg(database->db()), mQuery->getSQL());
     finalize();

@@ -138,6 +138,29 @@ TEST_F(CursorTest, ThrowsWhatAStepReports) {
     EXPECT_EQ(assertionOf([] { const Cursor cursor(nullptr, false); }), "query");
 }
 
+TEST_F(CursorTest, EndsAStepThatFailsWithoutASecondReport) {
+    // Both cursors have a statement of their own; the outer one's is left over.
+    Query query(&db(), "select abs(a) from (select 1 as a union all select -9223372036854775808)");
+    LogCapture log;
+    Cursor outer(query);
+    { const Cursor inner(query); }
+    EXPECT_THROW(outer.nextRow(), Exception);
+    EXPECT_FALSE(outer.hasRow());
+    EXPECT_FALSE(log.contains("sqlite3_finalize"));
+}
+
+TEST_F(QueryTest, LogsAFailureOfFinalize) {
+    LogCapture log;
+    const auto statement = db().compile("select abs(-9223372036854775808)");
+    EXPECT_EQ(statement->step(), SQLITE_ERROR);
+    const std::string address = OVFormat("%p", statement->getAddress());
+    statement->invalidate();
+    EXPECT_EQ(log.lines(), std::vector<std::string>{"[WARNING] Error from sqlite3_finalize(" +
+                                                    address + "): 1 / SQLITE_ERROR"});
+    EXPECT_FALSE(statement->isCurrent());
+    EXPECT_EQ(statement->columnIndex("a"), -1);
+}
+
 TEST_F(QueryTest, CompilesOnceForTwoCursorsInTurn) {
     Query query(&db(), "select 1 union select 2");
     const LoggingOn on({&gLogSQL});
