@@ -223,10 +223,17 @@ void Row::saveChanges() {
 
 void Row::deleteRow() {
     requireChangeable();
-    mChanged = false;
     // The table may have the last reference. An object that nobody owns yet must not get one.
     const Ref<Row> self = getRefCount() > 0 ? this : nullptr;
-    if (mTable) mTable->_deleteRow(this);
+    const bool wasChanged = mChanged;
+    mChanged = false;
+    try {
+        if (mTable) mTable->_deleteRow(this);
+    } catch (...) {
+        // The row is still there, and its changes are still to be saved.
+        mChanged = wasChanged;
+        throw;
+    }
     mRowID = 0;
     mTable = nullptr;
     mLoaded = true;

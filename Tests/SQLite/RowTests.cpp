@@ -230,6 +230,21 @@ TEST_F(RowTest, LeavesFileAndTableWhenItIsDeleted) {
     EXPECT_EQ(item->mTitle.getValue()->utf8(), "a");
 }
 
+TEST_F(RowTest, KeepsItsChangesIfItCannotBeDeleted) {
+    const LogCapture log;
+    const Ref<Item> item = Item::make("a");
+    item->saveChanges();
+    item->mNumber.setValue(5);
+    {
+        const Locker locker(path, "begin immediate");
+        EXPECT_EQ(codeOf([&] { item->deleteRow(); }), 5);
+    }
+    EXPECT_TRUE(item->isChanged() && item->isRetained());
+    EXPECT_EQ(items()->cachedRowWithID(1), item.get());
+    db().saveRows();
+    EXPECT_EQ(count("number=5"), 1);
+}
+
 TEST_F(RowTest, NeverTouchesTheFileIfItIsDeletedBeforeItIsSaved) {
     const LoggingOn on({&gLogSQL});
     LogCapture log;
