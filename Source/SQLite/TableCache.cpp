@@ -60,7 +60,9 @@ void Table::_deleteRow(Row* row) {
 void Table::_cacheRow(Row* row, bool retained) {
     if (row->mRowID == 0) return _cacheNewRow(row);
     gLogPersist.log("Table %s: Caching row #%lli [%p]", mName, row->mRowID, row);
-    mRows[row->mRowID] = row;
+    Row* const before = std::exchange(mRows[row->mRowID], row);
+    // One object stands for a row: if this one was let go of and lived on, another leaves.
+    if (before && before != row) before->setCached(false, false);
     row->setCached(true, retained || mRetainRows);
 }
 
@@ -94,17 +96,15 @@ void Table::_uncacheNewRow(Row* row) {
 void Table::uncacheRows() {
     const AutoreleasePool pool;
     gLogPersist.log("Table %s: Clearing row cache", mName);
-    Rows rows;
-    rows.swap(mRows);
     std::list<Ref<Row>> newRows;
     newRows.swap(mNewRows);
     mChanged = false;
     for (const Ref<Row>& row : newRows) {
         row->mNew = false;
     }
-    while (!rows.empty()) {
-        // A row that ends may take others with it, but none that the map does not own.
-        Row* row = rows.extract(rows.begin()).mapped();
+    while (!mRows.empty()) {
+        // A row that ends may take others with it, which then leave the map by themselves.
+        Row* row = mRows.extract(mRows.begin()).mapped();
         row->setCached(false, false);
     }
 }

@@ -223,6 +223,62 @@ TEST_F(TableTest, ForgetsAllRows) {
     EXPECT_NE(Ref<Group>(groups()->rowWithID(1)).get(), held.get());
 }
 
+namespace {
+
+/// A row that has another one of its table.
+class LinkedItem : public Item {
+ public:
+    using Item::Item;
+    Ref<LinkedItem> next;
+};
+
+}  // namespace
+
+TEST_F(TableTest, ForgetsARowThatEndsWithAnother) {
+    saveItem("a");
+    saveItem("b");
+    TableOf<LinkedItem> table(&db(), "Items", true, false);
+    {
+        const LogCapture log;
+        const AutoreleasePool inner;
+        const Ref<LinkedItem> owner = table.rowWithID(1);
+        owner->next = table.rowWithID(2);
+        owner->setChanged();
+    }
+    EXPECT_EQ(table.getCachedRowCount(), 2U);
+    LogCapture log;
+    table.uncacheRows();
+    EXPECT_EQ(table.getCachedRowCount(), 0U);
+    EXPECT_EQ(log.lines(),
+              std::vector<std::string>{"[WARNING] Dealloced Row Items[1] with unsaved changes!"});
+}
+
+TEST_F(TableTest, LetsGoOfARowWhoseForgottenObjectComesBack) {
+    saveGroups(1, 1);
+    const Ref<Group> old = groups()->rowWithID(1);
+    groups()->uncacheRows();
+    const Ref<Group> now = groups()->rowWithID(1);
+    EXPECT_EQ(now->getRefCount(), 2U);
+    old->mName.setValue(text("x"));
+    EXPECT_EQ(groups()->cachedRowWithID(1), old.get());
+    EXPECT_FALSE(now->isCached() || now->isRetained());
+    EXPECT_EQ(now->getRefCount(), 1U);
+}
+
+TEST_F(TableTest, CompilesItsStatementsForRowsOnce) {
+    saveItem("a");
+    saveItem("b");
+    const LoggingOn on({&gLogSQL});
+    LogCapture log;
+    for (const RowID rowID : {1, 2}) {
+        const Ref<Item> item = items()->rowWithID(rowID);
+        item->doLoad();
+        item->deleteRow();
+    }
+    EXPECT_EQ(log.count("\"SELECT * FROM Items WHERE rowID=?\" --> "), 1);
+    EXPECT_EQ(log.count("\"DELETE FROM Items WHERE rowID=?\" --> "), 1);
+}
+
 TEST_F(TableTest, LetsRowsGoWhenTheDatabaseCloses) {
     saveGroups(1, 6);
     const Ref<Group> held = groups()->rowWithID(1);
