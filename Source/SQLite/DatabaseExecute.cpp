@@ -78,16 +78,17 @@ void Database::_requireTransaction() {
 }
 
 void Database::beginTransaction(bool immediate) {
-    if (mTransactionDepth > 0) {
-        ++mTransactionDepth;
-        return;
+    if (++mTransactionDepth > 1) return;
+    try {
+        mTransactionStart = Clock::current().now();
+        gLogSQL.log(">>>> BEGIN %s TRANSACTION", immediate ? "IMMEDIATE" : "DEFERRED");
+        runWithRetry(immediate ? SQLText("begin immediate transaction")
+                               : SQLText("begin deferred transaction"));
+    } catch (...) {
+        // The depth counts transactions that are open.
+        --mTransactionDepth;
+        throw;
     }
-    mTransactionStart = Clock::current().now();
-    gLogSQL.log(">>>> BEGIN %s TRANSACTION", immediate ? "IMMEDIATE" : "DEFERRED");
-    // The depth counts transactions that are open, so a begin that fails leaves none.
-    runWithRetry(immediate ? SQLText("begin immediate transaction")
-                           : SQLText("begin deferred transaction"));
-    ++mTransactionDepth;
 }
 
 void Database::endTransaction() {

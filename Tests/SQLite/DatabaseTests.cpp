@@ -217,10 +217,12 @@ TEST_F(DatabaseTest, LogsWhatItRunsInAndOutOfTransactions) {
     EXPECT_TRUE(log.contains("[SQL] Exec update Items set number=1  -->0 [0.000 sec]"));
     db().beginTransaction(true);
     EXPECT_TRUE(log.contains("[SQL] >>>> BEGIN IMMEDIATE TRANSACTION"));
+    EXPECT_TRUE(log.contains("[SQL] Exec ( begin immediate transaction  -->0 ) [0.000 sec]"));
     db().execute("update Items set number=2");
     EXPECT_TRUE(log.contains("[SQL] Exec ( update Items set number=2  -->0 ) [0.000 sec]"));
     clock.jumpTo(clock.now() + 1.5);
     db().endTransaction();
+    EXPECT_TRUE(log.contains("[SQL] Exec commit  -->0 [0.000 sec]"));
     EXPECT_TRUE(log.contains("[SQL] <<<< END TRANSACTION (1.500 sec)"));
     db().beginTransaction(false);
     db().endTransaction();
