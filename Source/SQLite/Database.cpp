@@ -37,7 +37,10 @@ Database::Database()
       mCursorTimer(this, &Database::checkNoOpenCursor) {}
 
 Database::~Database() {
-    Foundation::callGuarded("virtual SQLite::Database::~Database()", [this] { close(true); });
+    constexpr const char* kWhere = "virtual SQLite::Database::~Database()";
+    Foundation::callGuarded(kWhere, [this] { close(true); });
+    // Changes that cannot be saved are lost. The connection must not stay open for them.
+    if (mDB) Foundation::callGuarded(kWhere, [this] { closeConnection(); });
     if (gDatabase == this) gDatabase = nullptr;
 }
 

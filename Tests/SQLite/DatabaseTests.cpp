@@ -17,6 +17,9 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include <algorithm>
+#include <filesystem>
+#include <functional>
 #include <thread>
 
 using namespace Foundation;
@@ -367,6 +370,41 @@ TEST_F(DatabaseTest, StopsItsTimersWhenItCloses) {
     db().open(path.c_str(), true);
     clock.advanceBy(10);
     EXPECT_TRUE(platform.posts.empty());
+}
+
+namespace {
+
+/// How many descriptors this process has for files of a folder.
+std::ptrdiff_t openFilesIn(const std::string& folder) {
+    using std::filesystem::directory_iterator;
+    return std::count_if(directory_iterator("/proc/self/fd"), directory_iterator(),
+                         [&](const auto& entry) {
+                             std::error_code error;
+                             const auto target = std::filesystem::read_symlink(entry, error);
+                             return target.string().starts_with(folder);
+                         });
+}
+
+}  // namespace
+
+TEST_F(DatabaseTest, EndsWithItsConnectionAlsoIfItCannotSave) {
+    LogCapture log;
+    const Support::TempDir otherDirectory;
+    const std::string otherPath = otherDirectory / "Other";
+    {
+        Database other;
+        other.open(otherPath.c_str(), true);
+        // As tables of the process do, it lives on.
+        static auto* const table = new TableOf<Item>(&other, "Items", true, false);
+        table->create(Item::kSchema, nullptr, nullptr);
+        for (int i = 0; i < 2; ++i) {
+            Item::make("same")->addToTable(table);
+        }
+        ASSERT_GT(openFilesIn(otherDirectory / ""), 0);
+    }
+    EXPECT_TRUE(log.contains("UNIQUE constraint failed: Items.title"));
+    EXPECT_TRUE(log.contains("virtual SQLite::Database::~Database()"));
+    EXPECT_EQ(openFilesIn(otherDirectory / ""), 0);
 }
 
 TEST_F(DatabaseTest, EndsStatementsThatOthersHoldWhenItCloses) {
