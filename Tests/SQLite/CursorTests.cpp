@@ -1,6 +1,5 @@
 #include "SQLite/Cursor.h"
 
-#include "Foundation/AssertionFailure.h"
 #include "Foundation/Logger.h"
 #include "SQLite/Exception.h"
 #include "SQLite/Statement.h"

@@ -1,9 +1,12 @@
-#include "Foundation/AssertionFailure.h"
 #include "Foundation/Logger.h"
 #include "Foundation/NotificationRecorder.h"
 #include "SQLite/Exception.h"
 #include "SQLite/StoreTest.h"
 #include "SQLite/Transaction.h"
+
+#include <sqlite3.h>
+
+#include <stdexcept>
 
 using namespace Foundation;
 using namespace SQLite;
@@ -32,6 +35,15 @@ class DatabaseChanges : public StoreTest {
     }
 
     NotificationRecorder rows;
+};
+
+class FailingTable : public TableOf<Item> {
+ public:
+    using TableOf::TableOf;
+    void _receiveChangeNotification(Dictionary*) override {
+        throw std::runtime_error("cannot receive");
+    }
+    void databaseClosing() override { throw std::runtime_error("cannot close"); }
 };
 
 }  // namespace
@@ -115,9 +127,73 @@ TEST_F(DatabaseChanges, SkipsTablesThatTheProcessHasNot) {
 }
 
 TEST_F(DatabaseChanges, NeverLetsAnExceptionIntoSqlite) {
+    // A reader that writes: what would let it do so is taken away.
     reopen(false);
+    db().setPostsNotifications(true);
+    sqlite3_set_authorizer(db().db(), nullptr, nullptr);
     LogCapture log;
-    EXPECT_THROW(db()._databaseUpdated(18, "Items", 1), AssertionFailure);
+    db().execute("insert into Items (title) values ('a')");
+    EXPECT_EQ(count("title='a'"), 1);
+    EXPECT_TRUE(log.contains("mWriteable"));
+    EXPECT_TRUE(
+        log.contains("static void SQLite::Database::_updateHook(void *, int, const char *, "
+                     "const char *, sqlite_int64)"));
+    clock.advanceBy(1);
+    EXPECT_TRUE(platform.posts.empty());
+}
+
+TEST_F(DatabaseChanges, ARollBackDropsWhatWasPendingBeforeIt) {
+    const LogCapture log;
+    db().execute("insert into Items (title) values ('a')");
+    EXPECT_THROW(
+        {
+            const Transaction transaction(true);
+            throw std::runtime_error("no");
+        },
+        std::runtime_error);
+    clock.advanceBy(1);
+    EXPECT_TRUE(platform.posts.empty());
+    EXPECT_EQ(count("1"), 1);
+}
+
+TEST_F(DatabaseChanges, ATableThatFailsToReceiveDoesNotStopTheOthers) {
+    const RowID rowID = saveItem("a");
+    reopen(false);
+    const FailingTable failing(&db(), "Failing", true, false);
+    const Ref<Item> item = items()->rowWithID(rowID);
+    item->doLoad();
+    using Rows = MutableDictionaryOf<String, Number>;
+    const Ref<Rows> changed{Rows::dictionary()};
+    changed->set("1", Number::number(23));
+    const Ref<MutableDictionary> all{MutableDictionary::dictionary()};
+    for (const char* table : {"Failing", "Items"}) {
+        all->set(table, static_cast<PFRefCounted*>(changed.get()));
+    }
+    LogCapture log;
+    platform.deliver("com.tarnwick.orvane.DBChanged", path, all.get());
+    EXPECT_TRUE(log.contains("cannot receive"));
+    EXPECT_TRUE(
+        log.contains("void SQLite::Database::_receiveChangeNotification("
+                     "Foundation::Notification *)"));
+    EXPECT_FALSE(item->isLoaded());
+    EXPECT_EQ(rows.objects.size(), 2U);
+}
+
+TEST_F(DatabaseChanges, ATableThatFailsToCloseEndsTheWalk) {
+    const RowID rowID = saveItem("a");
+    const FailingTable failing(&db(), "Failing", true, false);
+    TableOf<Item> after(&db(), "Items", true, false);
+    const Ref<Item> before = items()->rowWithID(rowID);
+    const Ref<Item> item = after.rowWithID(rowID);
+    LogCapture log;
+    db().close(true);
+    EXPECT_TRUE(log.contains("cannot close"));
+    EXPECT_TRUE(log.contains("void SQLite::Database::close(bool)"));
+    EXPECT_FALSE(before->isCached());
+    EXPECT_TRUE(item->isCached());
+    EXPECT_FALSE(db().isOpen());
+    reopen(true);
+    EXPECT_EQ(count("1"), 1);
 }
 
 TEST_F(DatabaseChanges, DescribesChangesForTheLog) {

@@ -451,10 +451,25 @@ TEST_F(DatabaseTest, InstallsTheFunctionsOfThePort) {
 #ifndef NDEBUG
 TEST_F(DatabaseTest, NoticesUseOnAnotherThread) {
     const LogCapture log;
-    std::string message;
-    std::thread other([&] { message = assertionOf([] { db()._checkThread(); }); });
+    const RowID rowID = saveItem("a");
+    const Ref<Item> item = items()->rowWithID(rowID);
+    Query query(&db(), "select 1");
+    const std::function<void()> uses[] = {
+        [] { db().db(); },
+        [&] { query.statement(); },
+        [&] { (void)items()->rowWithID(rowID); },
+        [&] { item->setChanged(); },
+        [&] { item->doLoad(); },
+    };
+    std::vector<std::string> messages;
+    std::thread other([&] {
+        for (const auto& use : uses) {
+            messages.push_back(assertionOf(use));
+        }
+    });
     other.join();
-    EXPECT_EQ(message, "Database used on another thread than the one that opened it");
+    const std::string message = "Database used on another thread than the one that opened it";
+    EXPECT_EQ(messages, std::vector<std::string>(std::size(uses), message));
 }
 
 TEST_F(DatabaseTest, NoticesAReadersCursorThatMeetsATurnOfTheRunLoop) {

@@ -73,6 +73,14 @@ INSTANTIATE_TEST_SUITE_P(All, ExceptionFatality,
                                          FatalCase{6, false}, FatalCase{13, false},
                                          FatalCase{14, false}, FatalCase{19, false}));
 
+TEST(Exception, IsTransientForOneCodeAlone) {
+    const Support::LogCapture log;
+    EXPECT_TRUE(Exception(14, "x").isTransient());
+    for (const int code : {0, 5, 6, 10, 14 + 256, 14 + 512}) {
+        EXPECT_FALSE(Exception::isTransient(code)) << code;
+    }
+}
+
 TEST(Exception, HasATextOfNameCodesMessageAndStatement) {
     const Support::LogCapture log;
     EXPECT_STREQ(Exception(1034, "disk I/O error", "select 1").what(),

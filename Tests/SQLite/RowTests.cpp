@@ -1,6 +1,5 @@
 #include "SQLite/Row.h"
 
-#include "Foundation/AssertionFailure.h"
 #include "Foundation/Logger.h"
 #include "SQLite/Exception.h"
 #include "SQLite/StoreTest.h"
@@ -269,6 +268,20 @@ TEST_F(RowTest, WarnsOfChangesThatAreLost) {
     saveItem("b");
     EXPECT_TRUE(log.contains("[Persist] Uncaching dealloced Row Items[1] 0x"));
     EXPECT_FALSE(log.contains("[WARNING]"));
+}
+
+TEST_F(RowTest, WarnsOfAReferenceThatOthersGaveUp) {
+    const RowID rowID = saveItem("a");
+    LogCapture log;
+    {
+        const Ref<Item> item = items()->rowWithID(rowID);
+        item->setCached(true, true);
+        item->release();
+    }
+    EXPECT_EQ(log.lines(), std::vector<std::string>{
+                               "[WARNING] Dealloced Row Items[1] with its mRetained flag set! "
+                               "Someone else has over-released it."});
+    EXPECT_EQ(items()->getCachedRowCount(), 0U);
 }
 
 TEST_F(RowTest, CountsRowsWhileTheyAreLogged) {

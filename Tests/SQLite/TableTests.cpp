@@ -1,6 +1,5 @@
 #include "SQLite/Table.h"
 
-#include "Foundation/AssertionFailure.h"
 #include "Foundation/Logger.h"
 #include "SQLite/CursorOf.h"
 #include "SQLite/Exception.h"
