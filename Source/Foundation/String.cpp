@@ -31,12 +31,15 @@ std::string plainText(StringReturner text) {
 }  // namespace
 
 StringReturner String::string(const char* utf8) {
-    if (!utf8) return nullptr;
+    return utf8 ? stringOfUTF8(utf8) : nullptr;
+}
+
+StringReturner String::stringOfUTF8(std::string utf8) {
     if (!UTF8::isValid(utf8)) {
         gWarn.log("String::string - unable to parse UTF-8 C string:\n\n%s\n", utf8);
         return nullptr;
     }
-    return string(std::string(utf8));
+    return string(std::move(utf8));
 }
 
 StringReturner String::string(std::string utf8) {

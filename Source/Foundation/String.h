@@ -27,6 +27,8 @@ class String : public PFRefCounted {
  public:
     /// The text of a UTF-8 C string; null for null and, with a warning, for what is not UTF-8.
     static StringReturner string(const char* utf8);
+    /// The same for a text that is handed over.
+    static StringReturner stringOfUTF8(std::string utf8);
     /// The text of UTF-8 that is known to be valid, such as what this process formatted.
     static StringReturner string(std::string utf8);
     /// The text of bytes in an encoding, without a byte order mark at its start; null if they are

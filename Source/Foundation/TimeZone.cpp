@@ -77,9 +77,18 @@ TimeZone::TimeZone(std::string name, std::unique_ptr<const Rules> rules)
 TimeZone::~TimeZone() = default;
 
 TimeZoneReturner TimeZone::fixedZone(std::int32_t secondsFromGMT) {
-    if (secondsFromGMT != 0) return TimeZoneReturner(new TimeZone(secondsFromGMT));
-    static const Ref<TimeZone> sGMT = TimeZoneReturner(new TimeZone(0));
-    return TimeZoneReturner(sGMT);
+    // The distances that people use are quarters of an hour, and come again and again. Others come
+    // from feeds as they like, and are not kept.
+    constexpr std::int32_t kStep = 900;
+    constexpr std::int32_t kMostSteps = 18 * 4;
+    const std::int32_t steps = secondsFromGMT / kStep;
+    if (secondsFromGMT % kStep != 0 || steps < -kMostSteps || steps > kMostSteps) {
+        return TimeZoneReturner(new TimeZone(secondsFromGMT));
+    }
+    static Ref<TimeZone> sZones[2 * kMostSteps + 1];
+    Ref<TimeZone>& zone = sZones[steps + kMostSteps];
+    if (!zone) zone = TimeZoneReturner(new TimeZone(secondsFromGMT));
+    return TimeZoneReturner(zone);
 }
 
 TimeZoneReturner TimeZone::timeZone(std::string_view name) {
@@ -94,10 +103,13 @@ TimeZoneReturner TimeZone::timeZone(const String* name) {
 }
 
 TimeZoneReturner TimeZone::timeZoneWithData(const Data* data) {
-    if (!data) return nullptr;
+    return data ? timeZoneWithData(data->view()) : nullptr;
+}
+
+TimeZoneReturner TimeZone::timeZoneWithData(std::string_view data) {
     // No abbreviations: a default zone may be called "CET" and have that place's rules.
-    if (const auto offset = readGMTOffset(data->view())) return fixedZone(*offset);
-    return place(data->view());
+    if (const auto offset = readGMTOffset(data)) return fixedZone(*offset);
+    return place(data);
 }
 
 DataReturner TimeZone::getData() const {

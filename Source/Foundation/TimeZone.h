@@ -29,6 +29,7 @@ class TimeZone : public PFRefCounted {
     /// The zone that `getData` made the data of; null for null, and if it is not one of this
     /// machine.
     static TimeZoneReturner timeZoneWithData(const Data* data);
+    static TimeZoneReturner timeZoneWithData(std::string_view data);
     /// The zone that is always `secondsFromGMT` ahead of GMT.
     static TimeZoneReturner fixedZone(std::int32_t secondsFromGMT);
 

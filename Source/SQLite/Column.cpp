@@ -1,10 +1,6 @@
 #include "SQLite/Column.h"
 
-#include "SQLite/Row.h"
-
 namespace SQLite {
-
-Column::Column(Row* row) : mRow(row), mLoaded(row->getTable() == nullptr) {}
 
 void Column::setChanged() {
     if (mChanged) return;

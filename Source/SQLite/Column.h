@@ -1,10 +1,9 @@
 #pragma once
 
 #include "Foundation/Uncopyable.h"
+#include "SQLite/Row.h"
 
 namespace SQLite {
-
-class Row;
 
 /// A persistent field of a row class, a member of the row that it belongs to. It knows whether it
 /// has been read from the file and whether it has changes that are not saved.
@@ -28,7 +27,7 @@ class Column : Foundation::Uncopyable {
 
  protected:
     /// A column of a row without a table has nothing to be read.
-    explicit Column(Row* row);
+    explicit Column(Row* row) : mRow(row), mLoaded(row->getTable() == nullptr) {}
 
     Row* mRow;
     bool mLoaded;

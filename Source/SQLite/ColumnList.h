@@ -18,7 +18,6 @@ class Table;
 /// What columns of one type do, for who knows a column only by its place in a list.
 struct ColumnKind {
     void (*bind)(const Column& column, Query& query, int index);
-    void (*load)(Column& column, const Cursor& cursor, int index);
     /// Saves the rows that a to-one or to-many column points at; null for a scalar one.
     void (*saveRows)(Column& column);
     /// Gives up the rows that it points at, when its own row is saved; null for a scalar one.
@@ -29,6 +28,8 @@ struct ColumnKind {
 struct ColumnSpec {
     const char* name;  ///< null for a to-many column, which is none of the table's own
     Column& (*in)(Row& row);
+    /// Takes over what a cursor has in a result column; not for a to-many column.
+    void (*load)(Row& row, const Cursor& cursor, int index);
     const ColumnKind* kind;
 };
 
@@ -46,6 +47,11 @@ ColumnSpec column(const char* name) {
     using Class = typename ColumnMember<decltype(Member)>::Class;
     using Type = typename ColumnMember<decltype(Member)>::ColumnType;
     return {name, [](Row& row) -> Column& { return static_cast<Class&>(row).*Member; },
+            [](Row& row, const Cursor& cursor, int index) {
+                if constexpr (requires(Type & type) { type.loadValue(cursor, index); }) {
+                    (static_cast<Class&>(row).*Member).loadValue(cursor, index);
+                }
+            },
             &Type::kKind};
 }
 /// The entry for a to-many member.

@@ -127,6 +127,19 @@ const char* Cursor::cStringColumn(int column) const {
         sqlite3_column_text(statement()->vm(), checkColumn(column)));
 }
 
+std::string_view Cursor::textColumn(int column) const {
+    const char* text = cStringColumn(column);
+    return text ? std::string_view(text) : std::string_view();
+}
+
+std::string_view Cursor::blobColumn(int column) const {
+    sqlite3_stmt* vm = statement()->vm();
+    const void* bytes = sqlite3_column_blob(vm, checkColumn(column));
+    const int count = sqlite3_column_bytes(vm, column);
+    if (!bytes || count == 0) return {};
+    return {static_cast<const char*>(bytes), static_cast<std::size_t>(count)};
+}
+
 Foundation::StringReturner Cursor::stringColumn(int column) const {
     return String::string(cStringColumn(column));
 }
@@ -141,20 +154,12 @@ Foundation::Returner<Date> Cursor::dateColumn(int column) const {
 }
 
 Foundation::DataReturner Cursor::dataColumn(int column) const {
-    sqlite3_stmt* vm = statement()->vm();
-    const void* bytes = sqlite3_column_blob(vm, checkColumn(column));
-    const int count = sqlite3_column_bytes(vm, column);
-    if (!bytes || count == 0) return nullptr;
-    return Data::data(bytes, count, true);
+    const std::string_view bytes = blobColumn(column);
+    return bytes.data() ? Data::adopt(std::string(bytes)) : nullptr;
 }
 
 Foundation::Returner<TimeZone> Cursor::timeZoneColumn(int column) const {
-    sqlite3_stmt* vm = statement()->vm();
-    const void* name = sqlite3_column_blob(vm, checkColumn(column));
-    const int length = sqlite3_column_bytes(vm, column);
-    if (!name || length == 0) return nullptr;
-    return TimeZone::timeZone(
-        std::string_view(static_cast<const char*>(name), static_cast<std::size_t>(length)));
+    return TimeZone::timeZoneWithData(blobColumn(column));
 }
 
 }  // namespace SQLite

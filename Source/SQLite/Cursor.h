@@ -5,6 +5,7 @@
 #include "SQLite/Query.h"
 
 #include <cstdint>
+#include <string_view>
 
 namespace SQLite {
 
@@ -55,6 +56,9 @@ class Cursor : Foundation::Uncopyable {
     double doubleColumn(int column) const;
     /// Null for null. Valid until the cursor moves.
     const char* cStringColumn(int column) const;
+    /// The same, and the bytes of a blob: without data for null, and for a blob of 0 bytes.
+    std::string_view textColumn(int column) const;
+    std::string_view blobColumn(int column) const;
     Foundation::StringReturner stringColumn(int column) const;
     Foundation::URLReturner urlColumn(int column) const;
     Foundation::Returner<Foundation::Date> dateColumn(int column) const;

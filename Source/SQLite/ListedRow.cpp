@@ -53,7 +53,7 @@ bool ListedRow::loadFrom(const Cursor& cursor) {
     for (std::size_t i = 0; i < list.count(); ++i) {
         const ColumnSpec& spec = list.at(i);
         // A result that lacks the column leaves it to be read later.
-        if (indexes[i] >= 0) spec.kind->load(spec.in(*this), cursor, indexes[i]);
+        if (indexes[i] >= 0) spec.load(*this, cursor, indexes[i]);
     }
     return true;
 }

@@ -119,6 +119,10 @@ Foundation::StringReturner Row::toString() const {
 
 void Row::unload() {
     mLoaded = false;
+    // What is not in the file has nothing to go back to: it stays to be saved.
+    if (!mChanged || mRowID == 0) return;
+    mChanged = false;
+    mTable->_rowUnchanged(this);
 }
 
 void Row::_forgetLoaded() {

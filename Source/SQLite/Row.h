@@ -31,7 +31,8 @@ class Row : public Foundation::RefCounted {
     /// "Class[Table #id] address"
     Foundation::StringReturner toString() const override;
 
-    /// Forgets what was read, and changes too: the next access reads the row anew.
+    /// Forgets what was read, and changes too: the next access reads the row anew. The row is then
+    /// not to be saved, and its table gives up a reference that it had for that.
     virtual void unload();
     /// Writes the row, if it is changed. Throws `Exception`, and `AssertionFailure` for a changed
     /// row in no table. May give up the last reference to the row.

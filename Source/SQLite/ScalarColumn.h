@@ -1,53 +1,27 @@
 #pragma once
 
-#include "Foundation/Data.h"
-#include "Foundation/Date.h"
-#include "Foundation/Ref.h"
-#include "Foundation/String.h"
-#include "Foundation/TimeZone.h"
 #include "SQLite/Column.h"
 #include "SQLite/ColumnList.h"
 #include "SQLite/Cursor.h"
 #include "SQLite/Query.h"
 #include "SQLite/Row.h"
-#include "SQLite/StoredURL.h"
+#include "SQLite/StoredValue.h"
 
 #include <type_traits>
 
 namespace SQLite {
 
-/// How a column keeps and reads a T: numbers as they are, value classes by reference.
+/// How a column keeps and reads a T: numbers as they are, value classes as `StoredValue`s.
 template <class T>
 struct ScalarValue {
-    using Stored = Foundation::Ref<T>;
+    using Stored = StoredValue<T>;
     using Argument = T*;
     static T* get(const Stored& stored) { return stored.get(); }
     static bool isEqual(const Stored& stored, T* value) {
         return Foundation::IsEqual(stored.get(), value);
     }
-    static Stored read(const Cursor& cursor, int column) {
-        if constexpr (std::is_same_v<T, Foundation::String>) {
-            return cursor.stringColumn(column);
-        } else if constexpr (std::is_same_v<T, Foundation::Date>) {
-            return cursor.dateColumn(column);
-        } else if constexpr (std::is_same_v<T, Foundation::Data>) {
-            return cursor.dataColumn(column);
-        } else {
-            return cursor.timeZoneColumn(column);
-        }
-    }
-};
-
-template <>
-struct ScalarValue<Foundation::URL> {
-    using Stored = StoredURL;
-    using Argument = Foundation::URL*;
-    static Foundation::URL* get(const Stored& stored) { return stored.get(); }
-    static bool isEqual(const Stored& stored, Foundation::URL* value) {
-        return Foundation::IsEqual(stored.get(), value);
-    }
-    static Stored read(const Cursor& cursor, int column) {
-        return Stored(cursor.stringColumn(column));
+    static void read(Stored& stored, const Cursor& cursor, int column) {
+        stored.read(cursor, column);
     }
 };
 
@@ -58,16 +32,16 @@ struct ScalarValue<T> {
     using Argument = T;
     static T get(T stored) { return stored; }
     static bool isEqual(T stored, T value) { return stored == value; }
-    static T read(const Cursor& cursor, int column) {
+    static void read(T& stored, const Cursor& cursor, int column) {
         if constexpr (std::is_same_v<T, bool>) {
-            return cursor.intColumn(column) != 0;
+            stored = cursor.intColumn(column) != 0;
         } else if constexpr (std::is_same_v<T, int>) {
-            return cursor.intColumn(column);
+            stored = cursor.intColumn(column);
         } else if constexpr (std::is_same_v<T, long long>) {
-            return cursor.int64Column(column);
+            stored = cursor.int64Column(column);
         } else {
             static_assert(std::is_same_v<T, double>);
-            return cursor.doubleColumn(column);
+            stored = cursor.doubleColumn(column);
         }
     }
 };
@@ -106,7 +80,7 @@ class ScalarColumn : public Column {
         loadValue(column.getCursor(), column.getIndex());
     }
     void loadValue(const Cursor& cursor, int index) {
-        if (!mChanged) mValue = Value::read(cursor, index);
+        if (!mChanged) Value::read(mValue, cursor, index);
         mLoaded = true;
     }
 
@@ -124,13 +98,10 @@ class ScalarColumn : public Column {
 };
 
 template <class T>
-const ColumnKind ScalarColumn<T>::kKind = {
-    [](const Column& column, Query& query, int index) {
-        static_cast<const ScalarColumn&>(column).bindTo(query, index);
-    },
-    [](Column& column, const Cursor& cursor, int index) {
-        static_cast<ScalarColumn&>(column).loadValue(cursor, index);
-    },
-    nullptr, nullptr};
+const ColumnKind ScalarColumn<T>::kKind = {[](const Column& column, Query& query, int index) {
+                                               static_cast<const ScalarColumn&>(column).bindTo(
+                                                   query, index);
+                                           },
+                                           nullptr, nullptr};
 
 }  // namespace SQLite

@@ -87,13 +87,10 @@ const std::vector<int>& Statement::columnIndexes(const ColumnList& list) const {
     return mIndexes;
 }
 
-int Statement::checkColumn(int column) const {
-    if (column < 0 || column >= mCols) {
-        Foundation::AssertionFailure::failed("int SQLite::Statement::checkColumn(int) const",
-                                             "column >= 0 && column < mCols",
-                                             "Invalid column index requested");
-    }
-    return column;
+void Statement::failColumn() {
+    Foundation::AssertionFailure::failed("int SQLite::Statement::checkColumn(int) const",
+                                         "column >= 0 && column < mCols",
+                                         "Invalid column index requested");
 }
 
 const char* Statement::sql() const {

@@ -38,7 +38,10 @@ class Statement : Foundation::Uncopyable {
     const std::vector<int>& columnIndexes(const ColumnList& list) const;
     int columnCount() const { return mCols; }
     /// Gives the index back. Throws `AssertionFailure` if there is no such result column.
-    int checkColumn(int column) const;
+    int checkColumn(int column) const {
+        if (column < 0 || column >= mCols) failColumn();
+        return column;
+    }
 
     sqlite3_stmt* vm() const { return mVM; }
     /// For logs.
@@ -48,6 +51,7 @@ class Statement : Foundation::Uncopyable {
  private:
     friend class Database;
 
+    [[noreturn]] static void failColumn();
     void noteReprepared();
 
     Database* mDatabase;

@@ -103,6 +103,8 @@ class Table : Foundation::Uncopyable {
     /// Inserts a row of those columns, a parameter for each.
     Query& _insertQuery(const ColumnList& columns);
     void _uncacheRow(Row* row);
+    /// Owns a row of the file no longer than it owns others, as nothing of it is to be saved.
+    void _rowUnchanged(Row* row);
     /// Makes a row changed again whose save was undone; a new one loses its ID.
     void _unsave(Row* row, bool wasNew, ColumnMask changed);
     /// Forgets what was read of the rows in memory, changes not.

@@ -33,14 +33,18 @@ void Table::_rowChanged(Row* row) {
 }
 
 void Table::_rowSaved(Row* row, bool wasNew) {
+    // A new row is still in the list and so outlives this; the map's reference can be the last one
+    // of an old row.
+    _rowUnchanged(row);
+    if (wasNew) _uncacheNewRow(row);
+}
+
+void Table::_rowUnchanged(Row* row) {
     if (mCacheAllRows) {
-        // A new row is still in the list and so outlives this; the map's reference can be the last
-        // one of an old row.
         _cacheRow(row, false);
     } else {
         _uncacheRow(row);
     }
-    if (wasNew) _uncacheNewRow(row);
 }
 
 void Table::_deleteRow(Row* row) {

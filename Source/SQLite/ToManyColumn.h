@@ -19,7 +19,7 @@ class ToManyColumn : public BasicToManyColumn {
 
 template <class T>
 const ColumnKind ToManyColumn<T>::kKind = {
-    nullptr, nullptr,
+    nullptr,
     [](Column& column) { static_cast<ToManyColumn&>(column).saveChanges(TableOf<T>::instance()); },
     nullptr};
 

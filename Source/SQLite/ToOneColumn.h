@@ -31,9 +31,6 @@ const ColumnKind ToOneColumn<T, WEAK>::kKind = {
     [](const Column& column, Query& query, int index) {
         static_cast<const ToOneColumn&>(column).bindTo(query, index);
     },
-    [](Column& column, const Cursor& cursor, int index) {
-        static_cast<ToOneColumn&>(column).loadValue(cursor, index);
-    },
     [](Column& column) { static_cast<ToOneColumn&>(column).saveChanges(TableOf<T>::instance()); },
     [](Column& column) { static_cast<ToOneColumn&>(column).clearChanged(); }};
 

@@ -125,6 +125,18 @@ TEST(TimeZone, HasANameThatIsReadBack) {
     EXPECT_EQ(zone("EST")->getName(), "GMT-05:00");
 }
 
+TEST(TimeZone, OfACommonDistanceIsMadeOnce) {
+    for (const std::int32_t seconds : {0, 900, -900, 3600, -16200, 64800, -64800}) {
+        const Ref<TimeZone> first = TimeZone::fixedZone(seconds);
+        EXPECT_EQ(first.get(), Ref<TimeZone>(TimeZone::fixedZone(seconds)).get()) << seconds;
+        EXPECT_EQ(first->getSecondsFromGMT(kWinter), seconds);
+    }
+    for (const std::int32_t seconds : {1, -899, 65700, -65700, INT32_MAX, INT32_MIN}) {
+        const Ref<TimeZone> first = TimeZone::fixedZone(seconds);
+        EXPECT_NE(first.get(), Ref<TimeZone>(TimeZone::fixedZone(seconds)).get()) << seconds;
+    }
+}
+
 TEST(TimeZone, IsReadBackFromItsData) {
     for (const char* name : {"Europe/Berlin", "GMT", "EST", "GMT-04:30", "EST5EDT"}) {
         const Ref<TimeZone> original = zone(name);

@@ -9,7 +9,9 @@ TEST(UTF8, TellsWhatIsValid) {
          {std::string_view(), std::string_view("abc"), std::string_view("\0", 1),
           std::string_view("\xC2\x80 \xDF\xBF \xE0\xA0\x80 \xEF\xBF\xBF"),
           std::string_view("\xF0\x90\x80\x80 \xF4\x8F\xBF\xBF")}) {
-        EXPECT_TRUE(UTF8::isValid(valid)) << valid;
+        for (std::size_t before = 0; before < 20; ++before) {
+            EXPECT_TRUE(UTF8::isValid(std::string(before, 'a').append(valid))) << valid;
+        }
     }
 }
 
@@ -17,7 +19,11 @@ class UTF8Refusals : public testing::TestWithParam<const char*> {};
 
 TEST_P(UTF8Refusals, AreNotValid) {
     EXPECT_FALSE(UTF8::isValid(GetParam()));
-    EXPECT_FALSE(UTF8::isValid("text " + std::string(GetParam()) + " text"));
+    // Behind so many others that it stands at each place of a word of the machine.
+    for (std::size_t before = 0; before < 20; ++before) {
+        const std::string text = std::string(before, 'a') + GetParam() + " and much text behind it";
+        EXPECT_FALSE(UTF8::isValid(text)) << before;
+    }
 }
 
 INSTANTIATE_TEST_SUITE_P(Of, UTF8Refusals,

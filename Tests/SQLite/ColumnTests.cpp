@@ -2,9 +2,11 @@
 #include "Foundation/Logger.h"
 #include "SQLite/StoreTest.h"
 #include "SQLite/UpdateQuery.h"
+#include "Support/DefaultZone.h"
 
 using namespace Foundation;
 using namespace SQLite;
+using Support::DefaultZone;
 using Support::LogCapture;
 using Support::LoggingOn;
 
@@ -76,6 +78,75 @@ TEST_F(ScalarColumnTest, KeepsTheOldValueAliveForThePool) {
     String* old = item->mTitle.getValue();
     item->mTitle.setValue(text("b"));
     EXPECT_EQ(old->utf8(), "a");
+}
+
+TEST_F(ScalarColumnTest, ReadsEachKindOfValue) {
+    const RowID rowID = saveItem("a");
+    db().execute(
+        "update Items set title='t\xC3\xA4', url='http://a.example/', date=5.5, bytes=x'0001ff', "
+        "zone=cast('Europe/Berlin' as blob)");
+    const Ref<Item> item = items()->rowWithID(rowID);
+    EXPECT_EQ(item->mTitle.getValue()->utf8(), "t\xC3\xA4");
+    EXPECT_EQ(Ref<String>(item->mURL.getValue()->getString())->utf8(), "http://a.example/");
+    EXPECT_EQ(item->mDate.getValue()->getAbsoluteTime(), 5.5);
+    EXPECT_EQ(item->mBytes.getValue()->view(), std::string_view("\0\1\xff", 3));
+    EXPECT_EQ(item->mZone.getValue()->getName(), "Europe/Berlin");
+    EXPECT_EQ(item->mTitle.getValue(), item->mTitle.getValue());
+}
+
+TEST_F(ScalarColumnTest, IsNullForWhatStandsForNoValue) {
+    const RowID rowID = saveItem("a");
+    const auto expectNulls = [&] {
+        const Ref<Item> item = items()->rowWithID(rowID);
+        EXPECT_EQ(item->mTitle.getValue(), nullptr);
+        EXPECT_EQ(item->mURL.getValue(), nullptr);
+        EXPECT_EQ(item->mDate.getValue(), nullptr);
+        EXPECT_EQ(item->mBytes.getValue(), nullptr);
+        EXPECT_EQ(item->mZone.getValue(), nullptr);
+    };
+    db().execute("update Items set title=null");
+    expectNulls();
+    db().execute("update Items set title=null, date=0.0, bytes=x'', zone=x'6d617273'");
+    expectNulls();
+}
+
+TEST_F(ScalarColumnTest, IsEmptyForAnEmptyText) {
+    const RowID rowID = saveItem("");
+    const Ref<Item> item = items()->rowWithID(rowID);
+    ASSERT_NE(item->mTitle.getValue(), nullptr);
+    EXPECT_TRUE(item->mTitle.getValue()->isEmpty());
+}
+
+TEST_F(ScalarColumnTest, WarnsOnceOfATextThatIsNotUTF8) {
+    const RowID rowID = saveItem("a");
+    db().execute("update Items set title=cast(x'ff' as text)");
+    const Ref<Item> item = items()->rowWithID(rowID);
+    const LogCapture log;
+    EXPECT_EQ(item->mNumber.getValue(), 0);
+    EXPECT_TRUE(log.lines().empty());
+    EXPECT_EQ(item->mTitle.getValue(), nullptr);
+    EXPECT_EQ(item->mTitle.getValue(), nullptr);
+    EXPECT_EQ(log.count("unable to parse UTF-8"), 1);
+}
+
+TEST_F(ScalarColumnTest, ReadsAZoneByThePlaceThatItWasWrittenWith) {
+    const DefaultZone central("CET");
+    const Ref<Item> item = Item::make("a");
+    item->mZone.setValue(TimeZone::defaultZone());
+    item->saveChanges();
+    item->unload();
+    const double summer = 174'000'000;  // in July 2006
+    EXPECT_EQ(item->mZone.getValue()->getSecondsFromGMT(summer), 7200);
+}
+
+TEST_F(ScalarColumnTest, KeepsTheOldValueAliveThroughALoad) {
+    const Ref<Item> item = Item::make("a");
+    item->saveChanges();
+    String* old = item->mTitle.getValue();
+    db().execute("update Items set title='b'");
+    item->doLoad();
+    EXPECT_EQ(old->utf8(), "a");
+    EXPECT_EQ(item->mTitle.getValue()->utf8(), "b");
 }
 
 TEST_F(ToOneColumnTest, PointsAtAnUnsavedRowWithoutAFault) {

@@ -300,6 +300,41 @@ TEST_F(RowTest, CountsRowsWhileTheyAreLogged) {
     EXPECT_EQ(log.count(" left]"), 2);
 }
 
+TEST_F(RowTest, IsNotToBeSavedOnceItIsUnloaded) {
+    const Ref<Item> item = Item::make("a");
+    item->saveChanges();
+    item->mNumber.setValue(5);
+    ASSERT_TRUE(item->isChanged() && item->isRetained());
+    item->unload();
+    EXPECT_FALSE(item->isChanged() || item->isRetained());
+    EXPECT_TRUE(item->isCached());
+    EXPECT_EQ(item->getRefCount(), 1U);
+    platform.posts.clear();
+    const LogCapture log;
+    db().saveRows();
+    EXPECT_FALSE(log.contains("*** Saving all database changes"));
+    EXPECT_EQ(lastChanges(), "");
+}
+
+TEST_F(RowTest, IsToBeSavedForTheFirstTimeEvenIfItIsUnloaded) {
+    const Ref<Item> item = Item::make("a");
+    item->addToTable(items());
+    item->unload();
+    EXPECT_TRUE(item->isChanged());
+    db().saveRows();
+    EXPECT_EQ(count("1"), 1);
+}
+
+TEST_F(RowTest, ChangesAgainAfterItWasUnloaded) {
+    const Ref<Item> item = Item::make("a");
+    item->saveChanges();
+    item->mNumber.setValue(5);
+    item->unload();
+    item->mNumber.setValue(6);
+    db().saveRows();
+    EXPECT_EQ(count("number=6"), 1);
+}
+
 TEST_F(RowTest, UnloadingGivesChangesUp) {
     const Ref<Item> item = Item::make("a");
     item->saveChanges();
