@@ -3,9 +3,11 @@
 #include "Foundation/UTF8.h"
 
 #include <unicode/ucnv.h>
+#include <unicode/ucnv_cb.h>
 #include <cstring>
 #include <iterator>
 #include <memory>
+#include <utility>
 
 namespace Foundation {
 
@@ -25,13 +27,28 @@ void stopReading(const void*, UConverterToUnicodeArgs*, const char*, int32_t,
 void stopWriting(const void*, UConverterFromUnicodeArgs*, const UChar*, int32_t, UChar32,
                  UConverterCallbackReason, UErrorCode*) {}
 
-/// `bytes` from one encoding in another; none if that cannot be done in full.
-std::optional<std::string> convert(const char* from, const char* to, std::string_view bytes) {
+/// ICU's own replacement for a single byte is a control character.
+void replaceReading(const void*, UConverterToUnicodeArgs* args, const char*, int32_t,
+                    UConverterCallbackReason reason, UErrorCode* status) {
+    if (reason > UCNV_IRREGULAR) return;
+    constexpr UChar kReplacement = 0xFFFD;
+    *status = U_ZERO_ERROR;
+    ucnv_cbToUWriteUChars(args, &kReplacement, 1, 0, status);
+}
+
+/// What a conversion does about what it cannot read.
+enum class Otherwise { Stop, Replace };
+
+/// `bytes` from one encoding in another; none if that cannot be done.
+std::optional<std::string> convert(const char* from, const char* to, std::string_view bytes,
+                                   Otherwise otherwise = Otherwise::Stop) {
     if (bytes.empty()) return std::string();
     UErrorCode status = U_ZERO_ERROR;
     const Converter source(ucnv_open(from, &status));
     const Converter target(ucnv_open(to, &status));
-    ucnv_setToUCallBack(source.get(), stopReading, nullptr, nullptr, nullptr, &status);
+    const UConverterToUCallback reading =
+        otherwise == Otherwise::Stop ? stopReading : replaceReading;
+    ucnv_setToUCallBack(source.get(), reading, nullptr, nullptr, nullptr, &status);
     ucnv_setFromUCallBack(target.get(), stopWriting, nullptr, nullptr, nullptr, &status);
     if (U_FAILURE(status)) return std::nullopt;
 
@@ -84,6 +101,13 @@ std::optional<std::string> StringEncoding::decode(std::string_view bytes) const 
         text = bytes;
     }
     if (text && text->starts_with(kByteOrderMark)) text->erase(0, kByteOrderMark.size());
+    return text;
+}
+
+std::string StringEncoding::decodeLeniently(std::string_view bytes) const {
+    if (std::optional<std::string> text = decode(bytes)) return std::move(*text);
+    std::string text = convert(mName, kUTF8.mName, bytes, Otherwise::Replace).value_or("");
+    if (text.starts_with(kByteOrderMark)) text.erase(0, kByteOrderMark.size());
     return text;
 }
 

@@ -30,6 +30,8 @@ class StringEncoding {
     /// The text of bytes in this encoding, as UTF-8, without a byte order mark at its start. None
     /// if they are not all text of this encoding.
     std::optional<std::string> decode(std::string_view bytes) const;
+    /// The same, with U+FFFD in the place of what is no text.
+    std::string decodeLeniently(std::string_view bytes) const;
     /// The bytes of a UTF-8 text in this encoding. None if it has no form for all characters.
     std::optional<std::string> encode(std::string_view utf8) const;
 

@@ -83,6 +83,15 @@ TEST(StringEncoding, ReadsOnlyWhatIsAllText) {
     EXPECT_EQ(StringEncoding::named("Shift_JIS")->decode("\x93"), std::nullopt);
 }
 
+TEST(StringEncoding, ReadsWhatIsNoTextAsTheReplacementWhereAskedTo) {
+    EXPECT_EQ(StringEncoding::kUTF8.decodeLeniently("a\xE9 b\xC3\xA9"), "a\xEF\xBF\xBD b\xC3\xA9");
+    EXPECT_EQ(StringEncoding::kASCII.decodeLeniently("a\xE9"), "a\xEF\xBF\xBD");
+    EXPECT_EQ(StringEncoding::named("Shift_JIS")->decodeLeniently("\x93\xFA\x93"),
+              "\xE6\x97\xA5\xEF\xBF\xBD");
+    EXPECT_EQ(StringEncoding::kUTF8.decodeLeniently("\xEF\xBB\xBF\xE9"), "\xEF\xBF\xBD");
+    EXPECT_EQ(StringEncoding::kLatin1.decodeLeniently("a\xE9"), "a\xC3\xA9");
+}
+
 TEST(StringEncoding, WritesOnlyWhatHasAForm) {
     EXPECT_EQ(StringEncoding::kASCII.encode("a\xC3\xA9"), std::nullopt);
     EXPECT_EQ(StringEncoding::kLatin1.encode("\xE2\x82\xAC"), std::nullopt);

@@ -1,0 +1,49 @@
+#pragma once
+
+#include "FeedParser/Text/TidyResult.h"
+#include "Foundation/Data.h"
+#include "Foundation/RefCounted.h"
+#include "Foundation/Returner.h"
+#include "Foundation/URL.h"
+
+#include <memory>
+#include <string_view>
+
+namespace Orvane::FeedParser {
+
+class TidyDocument;
+
+/// Repairs markup with HTML Tidy. The classes derived from it differ in what they take the markup
+/// for.
+///
+/// Whatever its encoding, markup is made UTF-8 before it is repaired, as far as the encoding is
+/// known: Tidy cuts references to characters that its own output cannot hold.
+class Tidier : public Foundation::RefCounted {
+ public:
+    ~Tidier() override;
+
+    /// Sets the options of `mDoc`. False if Tidy refuses one.
+    virtual bool setupTidyOptions();
+    virtual const char* getClassName() const = 0;
+
+    /// The repaired markup. `data` itself if there is nothing to repair: no "<" and no "&". Null
+    /// if the markup is beyond repair, or takes too much time or memory. `encoding` is libxml2's
+    /// `xmlCharEncoding` of the bytes; where that tells none, the markup's own declaration counts.
+    /// `baseURL`, which may be null, is what relative URLs in a snippet count from. Never throws
+    /// for bad markup.
+    Foundation::DataReturner tidy(Foundation::Data* data, int encoding, Foundation::URL* baseURL);
+
+    /// Makes `mDoc` with its options, if it is not there. False if it cannot be had.
+    bool open();
+
+ protected:
+    Tidier();
+
+    /// Repairs in this process, for as long as it takes.
+    TidyResult repair(std::string_view bytes, int encoding, Foundation::URL* baseURL);
+
+    std::unique_ptr<TidyDocument> mDoc;  ///< made on first use, and anew after a failure
+    bool mTrim = false;                  ///< strip white space from the end of the output
+};
+
+}  // namespace Orvane::FeedParser

@@ -1,0 +1,21 @@
+#pragma once
+
+#include <string>
+
+namespace Orvane::FeedParser {
+
+/// What tidying a document came to.
+struct TidyResult {
+    /// Tidy's own: 0, 1 with warnings, 2 with errors that it cannot mend, negative where it could
+    /// not go on.
+    int code = kNothing;
+    std::string output;    ///< of 0 and 1
+    std::string messages;  ///< what Tidy wrote about it, of other results
+
+    bool isSuccess() const { return code == 0 || code == 1; }
+
+    /// There is no result: Tidy could not be set up, or took too much.
+    static constexpr int kNothing = -1000;
+};
+
+}  // namespace Orvane::FeedParser

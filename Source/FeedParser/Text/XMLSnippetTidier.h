@@ -1,0 +1,15 @@
+#pragma once
+
+#include "FeedParser/Text/Tidier.h"
+
+namespace Orvane::FeedParser {
+
+/// Makes XHTML, safe to show, of the XML content of an entry.
+class XMLSnippetTidier : public Tidier {
+ public:
+    XMLSnippetTidier() { mTrim = true; }
+    bool setupTidyOptions() override;
+    const char* getClassName() const override { return "XMLSnippetTidier"; }
+};
+
+}  // namespace Orvane::FeedParser
