@@ -89,8 +89,19 @@ bool isSchemaTable(const char* name) {
                     std::strcmp(name, "sqlite_temp_master") == 0);
 }
 
+bool dropsViewOrTemporary(int action) {
+    return action == SQLITE_DROP_VIEW || action == SQLITE_DROP_TEMP_VIEW ||
+           action == SQLITE_DROP_TEMP_TABLE;
+}
+
+/// The name in the last call, if that was for a drop that is allowed.
+const char* sDropped = nullptr;
+
 int readOnlyAuthorizer(void*, int action, const char* p1, const char* p2, const char*,
                        const char*) {
+    // The next thing that is asked of a drop is whether the rows of what has this name may go.
+    const char* dropped = std::exchange(sDropped, dropsViewOrTemporary(action) ? p1 : nullptr);
+    if (action == SQLITE_DELETE && p1 && p1 == dropped) return SQLITE_OK;
     if (!isDenied(action) || isSchemaTable(p1)) return SQLITE_OK;
     gWarn.log("Database: Illegal operation on read-only database (action=%i, p1='%s', p2='%s')",
               action, p1, p2);
