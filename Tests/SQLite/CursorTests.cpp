@@ -117,6 +117,7 @@ TEST_F(CursorTest, LogsItsSteps) {
     cursor.nextRow();
     EXPECT_TRUE(log.contains("[SQL] Cursor 0x"));
     EXPECT_TRUE(log.contains(" \"select 1\" ..."));
+    EXPECT_EQ(log.count("[SQL]   step 0x"), 1);
     EXPECT_EQ(log.count(" [1]"), 1);
     EXPECT_EQ(log.count("[SQL] ---end 0x"), 1);
 }

@@ -230,6 +230,18 @@ TEST_F(DatabaseChanges, SavesSoonOnceFiveSecondsAfterTheFirstRequest) {
     EXPECT_EQ(platform.posts.size(), 1U);
 }
 
+TEST_F(DatabaseChanges, ASaveIsNoLongerDueOnceItIsDone) {
+    const Ref<Item> item = Item::make("a");
+    item->addToTable(items());
+    db().saveRowsSoon();
+    clock.advanceBy(1);
+    db().saveRows();
+    item->mNumber.setValue(1);
+    clock.advanceBy(20);
+    EXPECT_EQ(count("number=0"), 1);
+    item->unload();
+}
+
 TEST_F(DatabaseChanges, SavesWithoutATransactionWhereNothingChanged) {
     const LoggingOn on({&gLogSQL});
     LogCapture log;
@@ -242,7 +254,7 @@ TEST_F(DatabaseChanges, SavesTablesInTheOrderOfTheirFirstUse) {
     note->addToTable(notes());
     const Ref<Group> group = Group::make("g");
     group->addToTable(groups());
-    const LoggingOn on({&gLogPersist});
+    const LoggingOn on({&gLogPersist, &gLogSQL});
     LogCapture log;
     db().saveRows();
     std::vector<std::string> inserted;
@@ -251,6 +263,7 @@ TEST_F(DatabaseChanges, SavesTablesInTheOrderOfTheirFirstUse) {
     }
     EXPECT_EQ(inserted, (std::vector<std::string>{"[Persist] Inserting Row into Groups",
                                                   "[Persist] Inserting Row into Notes"}));
+    EXPECT_EQ(log.count(">>>> BEGIN IMMEDIATE TRANSACTION"), 1);
     EXPECT_EQ(platform.posts.size(), 1U);
 }
 

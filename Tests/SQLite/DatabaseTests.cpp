@@ -448,6 +448,31 @@ TEST_F(DatabaseTest, InstallsTheFunctionsOfThePort) {
     EXPECT_TRUE(log.contains("one, please"));
 }
 
+namespace {
+
+/// Asks for more arguments than sqlite3 allows.
+class Refused : public SQLFunctionPort {
+ public:
+    Refused() { setCurrent(this); }
+    ~Refused() override { setCurrent(nullptr); }
+    void installFunctions(SQLFunctionInstaller& installer) override {
+        added = installer.add("refused", 1000, [](SQLFunctionCall&) {});
+    }
+    bool added = true;
+};
+
+}  // namespace
+
+TEST_F(DatabaseTest, OpensWithoutAFunctionThatSqliteRefuses) {
+    const Refused port;
+    const LoggingOn on({});
+    LogCapture log;
+    reopen(true);
+    EXPECT_FALSE(port.added);
+    EXPECT_TRUE(log.contains("Database: sqlite3_create_function returned error 21"));
+    EXPECT_TRUE(db().isOpen());
+}
+
 #ifndef NDEBUG
 TEST_F(DatabaseTest, NoticesUseOnAnotherThread) {
     const LogCapture log;

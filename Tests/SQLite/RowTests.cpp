@@ -146,11 +146,13 @@ TEST_F(RowTest, MayNotBeChangedInAReader) {
     const Ref<Group> group = Group::make("g");
     reopen(false);
     const LogCapture log;
+    TableOf<Item> missing(&db(), "Missing", true, false);
     const Ref<Item> item = items()->rowWithID(rowID);
     for (const std::function<void()>& change : std::vector<std::function<void()>>{
              [&] { item->mNumber.setValue(9); }, [&] { item->setChanged(); },
              [&] { item->deleteRow(); }, [&] { group->addToTable(groups()); },
-             [&] { items()->addColumn("x", "text"); }, [&] { items()->addIndex("i", "title"); }}) {
+             [&] { items()->addColumn("x", "text"); }, [&] { items()->addIndex("i", "title"); },
+             [&] { missing.create("a", nullptr, nullptr); }}) {
         try {
             change();
             ADD_FAILURE();
