@@ -44,7 +44,9 @@ Cursor::~Cursor() {
 void Cursor::_init() {
     mStatement = mQuery->takeStatement();
     gLogSQL.log("Cursor %p \"%s\" ...", mStatement->getAddress(), mQuery->getSQL());
-    mQuery->getDatabase()->_cursorOpened();
+    Database* database = mQuery->getDatabase();
+    // A process that only reads must not keep the writer's log from being folded back.
+    database->cursors().open(database->isOpen() && !database->isWriteable());
     nextRow();
 }
 
@@ -77,7 +79,7 @@ void Cursor::failStep(int result) {
 void Cursor::finalize() {
     if (!mStatement) return;
     gLogSQL.log("---end %p", mStatement->getAddress());
-    mQuery->getDatabase()->_cursorClosed();
+    mQuery->getDatabase()->cursors().close();
     mQuery->returnStatement(std::move(mStatement));
 }
 

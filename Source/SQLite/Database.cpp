@@ -33,8 +33,7 @@ void Database::initialize() {
 Database::Database()
     : mSaveTimer(this, &Database::saveRows),
       mPostTimer(this, &Database::_postChangeNotification),
-      mFatalTimer(this, &Database::_postFatalErrorNotification),
-      mCursorTimer(this, &Database::checkNoOpenCursor) {}
+      mFatalTimer(this, &Database::_postFatalErrorNotification) {}
 
 Database::~Database() {
     constexpr const char* kWhere = "virtual SQLite::Database::~Database()";
@@ -135,13 +134,10 @@ void Database::_removeStatement(Statement* statement) {
     statement->mPrevious = statement->mNext = nullptr;
 }
 
-bool Database::anyTableChanged() {
-    return std::any_of(mTables.begin(), mTables.end(), [](Table* t) { return t->isChanged(); });
-}
-
 void Database::saveRows() {
     mSaveTimer.stop();
-    if (!anyTableChanged()) return;
+    const auto isChanged = [](Table* table) { return table->isChanged(); };
+    if (std::none_of(mTables.begin(), mTables.end(), isChanged)) return;
     gLog.log("*** Saving all database changes");
     const Transaction transaction(this, true);
     // A row's save may be the first use of a further table.
@@ -153,21 +149,6 @@ void Database::saveRows() {
 void Database::saveRowsSoon() {
     gLog.log("(Will save database changes in 5 sec)");
     if (!mSaveTimer.isRunning()) mSaveTimer.start(kSaveDelaySeconds, false);
-}
-
-void Database::_cursorOpened() {
-    ++mOpenCursors;
-#ifndef NDEBUG
-    if (!mWriteable && mOpen && !mCursorTimer.isRunning()) mCursorTimer.start(0.0, false);
-#endif
-}
-
-/// Called by the run loop, so every cursor that is open has met a turn of it.
-void Database::checkNoOpenCursor() {
-    if (mOpenCursors > 0) {
-        AssertionFailure::failed("void SQLite::Database::checkNoOpenCursor()", "mOpenCursors==0",
-                                 "Cursor lives across a turn of the run loop");
-    }
 }
 
 }  // namespace SQLite

@@ -7,6 +7,8 @@
 #include "Foundation/Timer.h"
 #include "Foundation/Uncopyable.h"
 #include "SQLite/ChangeSet.h"
+#include "SQLite/CursorWatch.h"
+#include "SQLite/DeletedRows.h"
 #include "SQLite/RowJournal.h"
 #include "SQLite/SQLText.h"
 #include "SQLite/Types.h"
@@ -131,6 +133,8 @@ class Database : Foundation::Uncopyable {
 
     sqlite3* db() const;
     RowJournal& journal() { return mJournal; }
+    DeletedRows& deletedRows() { return mDeletedRows; }
+    CursorWatch& cursors() { return mCursors; }
     void _addTable(Table* table);
     void _removeTable(Table* table);
     void _addStatement(Statement* statement);
@@ -140,13 +144,8 @@ class Database : Foundation::Uncopyable {
     /// Throws if sqlite3 has ended the open transaction by itself: what is written behind that
     /// would be in the file although the transaction is not.
     void _requireTransaction();
-    void _cursorOpened();
-    void _cursorClosed() { --mOpenCursors; }
     /// Debug builds throw `AssertionFailure` on another thread than the connection's.
     void _checkThread() const;
-    /// Whether a delete that is still to be announced was undone.
-    bool _isUndoneDelete(const Table* table, RowID rowID) const;
-    void _noteDelete(const Table* table, RowID rowID);
     void _databaseUpdated(int action, const char* table, RowID rowID);
     void _postChangeNotification();
     void _postFatalErrorNotification();
@@ -154,7 +153,6 @@ class Database : Foundation::Uncopyable {
 
  private:
     using ChangeObserver = Orvane::MethodReceiver<Foundation::Notification, Database>;
-    using Deletes = std::vector<std::pair<const Table*, RowID>>;
 
     void openConnection(const char* path);
     void configureConnection();
@@ -162,20 +160,13 @@ class Database : Foundation::Uncopyable {
     void stopObserving();
     void closeConnection();
     void stopTimers();
-    bool anyTableChanged();
 
     int runWithRetry(const SQLText& text);
-    int runOnce(const SQLText& text, char** error);
-    void logRun(const SQLText& text, int result, double seconds);
     void commit();
     void rollBack();
-    bool passesIntegrityCheck();
-    void reportIntegrity();
 
     Foundation::Ref<Foundation::String> getPathString() const;
     void _postLocalChangeNotifications(const Foundation::Dictionary* changes);
-    void tellTables(const Foundation::Dictionary* changes);
-    void checkNoOpenCursor();
 
     sqlite3* mDB = nullptr;
     Foundation::Ref<Foundation::URL> mLocation;
@@ -194,13 +185,11 @@ class Database : Foundation::Uncopyable {
     std::unique_ptr<ChangeObserver> mChangeObserver;
 
     RowJournal mJournal;
-    Deletes mDeletes;        ///< of the open transaction
-    Deletes mUndoneDeletes;  ///< of a failed commit whose changes are still to be announced
+    DeletedRows mDeletedRows;
     Statement* mStatements = nullptr;
     std::uint32_t mCompiled = 0;  ///< statements, while they are logged
     Foundation::ThreadID mThread = 0;
-    int mOpenCursors = 0;
-    Foundation::Timer<Database> mCursorTimer;
+    CursorWatch mCursors;
 };
 
 /// The database of the process, or null.

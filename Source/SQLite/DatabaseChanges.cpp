@@ -9,8 +9,6 @@
 
 #include <sqlite3.h>
 
-#include <algorithm>
-#include <cstring>
 #include <utility>
 
 namespace SQLite {
@@ -33,6 +31,21 @@ void updateHook(void* self, int action, const char*, const char* table, sqlite3_
         [&] { static_cast<Database*>(self)->_databaseUpdated(action, table, rowID); });
 }
 
+/// Tells each table what another process has changed of it.
+void tellTables(Database& database, const Dictionary* changes) {
+    for (const auto& entry : *changes) {
+        Foundation::callGuarded(
+            "void SQLite::Database::_receiveChangeNotification(Foundation::Notification *)", [&] {
+                const auto& [name, value] = entry;
+                auto* text = dynamic_cast<String*>(name);
+                auto* rows = dynamic_cast<Dictionary*>(value);
+                Table* table =
+                    text && rows ? database.getRegisteredTable(text->utf8().c_str()) : nullptr;
+                if (table) table->_receiveChangeNotification(rows);
+            });
+    }
+}
+
 }  // namespace
 
 void Database::setPostsNotifications(bool posts) {
@@ -45,20 +58,8 @@ void Database::_databaseUpdated(int action, const char* table, RowID rowID) {
     OV_ASSERT(mWriteable);
     if (!mChanges) mChanges = std::make_unique<ChangeSet>();
     mChanges->note(action, table, rowID);
-    std::erase_if(mUndoneDeletes, [&](const auto& undone) {
-        return action == SQLITE_DELETE && undone.second == rowID &&
-               std::strcmp(undone.first->getName(), table) == 0;
-    });
+    if (action == SQLITE_DELETE) mDeletedRows.forgetUndone(table, rowID);
     if (mTransactionDepth == 0 && !mPostTimer.isRunning()) mPostTimer.start(0.0, false);
-}
-
-void Database::_noteDelete(const Table* table, RowID rowID) {
-    if (isInTransaction()) mDeletes.emplace_back(table, rowID);
-}
-
-bool Database::_isUndoneDelete(const Table* table, RowID rowID) const {
-    return std::find(mUndoneDeletes.begin(), mUndoneDeletes.end(), std::pair(table, rowID)) !=
-           mUndoneDeletes.end();
 }
 
 void Database::_postChangeNotification() {
@@ -75,7 +76,7 @@ void Database::_postChangeNotification() {
     NotificationCenter::getDistributed()->post(kDatabaseChangedNotification, path.get(),
                                                changes.get(), kNotificationDeliverImmediately);
     _postLocalChangeNotifications(changes.get());
-    mUndoneDeletes.clear();
+    mDeletedRows.forgetAllUndone();
 }
 
 void Database::_postLocalChangeNotifications(const Dictionary* changes) {
@@ -96,21 +97,8 @@ void Database::_receiveChangeNotification(Notification* notification) {
     }
     if (!changes.get()) return;
     // Every table lets go of what is out of date before anybody is told.
-    tellTables(changes.get());
+    tellTables(*this, changes.get());
     _postLocalChangeNotifications(changes.get());
-}
-
-void Database::tellTables(const Dictionary* changes) {
-    for (const auto& entry : *changes) {
-        Foundation::callGuarded(
-            "void SQLite::Database::_receiveChangeNotification(Foundation::Notification *)", [&] {
-                const auto& [name, value] = entry;
-                auto* text = dynamic_cast<String*>(name);
-                auto* rows = dynamic_cast<Dictionary*>(value);
-                Table* table = text && rows ? getRegisteredTable(text->utf8().c_str()) : nullptr;
-                if (table) table->_receiveChangeNotification(rows);
-            });
-    }
 }
 
 void Database::_postFatalErrorNotification() {

@@ -17,6 +17,45 @@ using Foundation::Clock;
 using Foundation::gLog;
 using Foundation::gWarn;
 
+namespace {
+
+void logRun(const Database& database, const SQLText& text, int result, double seconds) {
+    if (database.isInTransaction()) {
+        gLogSQL.log("Exec ( %s  -->%i ) [%.3lf sec]", text.c_str(), result, seconds);
+    } else {
+        gLogSQL.log("Exec %s  -->%i [%.3lf sec]", text.c_str(), result, seconds);
+    }
+}
+
+int runOnce(const Database& database, const SQLText& text, char** error) {
+    *error = nullptr;
+    if (!gLogSQL.willLog())
+        return sqlite3_exec(database.db(), text.c_str(), nullptr, nullptr, error);
+    const double start = Clock::current().now();
+    const int result = sqlite3_exec(database.db(), text.c_str(), nullptr, nullptr, error);
+    logRun(database, text, result, Clock::current().now() - start);
+    return result;
+}
+
+bool passesIntegrityCheck(Database& database) {
+    bool passes = false;
+    for (Cursor cursor(&database, "pragma integrity_check"); cursor.hasRow(); cursor.nextRow()) {
+        const char* text = cursor.cStringColumn(0);
+        passes = text && std::strcmp(text, "ok") == 0;
+    }
+    return passes;
+}
+
+void reportIntegrity(Database& database) {
+    gWarn.log("*** SQLite integrity check failed! Details:");
+    for (Cursor cursor(&database, "pragma integrity_check"); cursor.hasRow(); cursor.nextRow()) {
+        gWarn.log("    %s", cursor.cStringColumn(0));
+    }
+    database._throwQueryException(Exception(SQLITE_CORRUPT, "integrity check failed"));
+}
+
+}  // namespace
+
 int Database::executeText(const SQLText& text) {
     _requireTransaction();
     return runWithRetry(text);
@@ -24,13 +63,13 @@ int Database::executeText(const SQLText& text) {
 
 int Database::runWithRetry(const SQLText& text) {
     char* error = nullptr;
-    int result = runOnce(text, &error);
+    int result = runOnce(*this, text, &error);
     for (int run = 2; run <= kMaxRuns && Exception::isTransient(result); ++run) {
         if (error) {
             Clock::current().sleep(0.1 * run * run);
             sqlite3_free(error);
         }
-        result = runOnce(text, &error);
+        result = runOnce(*this, text, &error);
     }
     if (result != SQLITE_OK) {
         const Exception exception(result, error, text.c_str());
@@ -38,23 +77,6 @@ int Database::runWithRetry(const SQLText& text) {
         _throwQueryException(exception);
     }
     return sqlite3_changes(db());
-}
-
-int Database::runOnce(const SQLText& text, char** error) {
-    *error = nullptr;
-    if (!gLogSQL.willLog()) return sqlite3_exec(db(), text.c_str(), nullptr, nullptr, error);
-    const double start = Clock::current().now();
-    const int result = sqlite3_exec(db(), text.c_str(), nullptr, nullptr, error);
-    logRun(text, result, Clock::current().now() - start);
-    return result;
-}
-
-void Database::logRun(const SQLText& text, int result, double seconds) {
-    if (isInTransaction()) {
-        gLogSQL.log("Exec ( %s  -->%i ) [%.3lf sec]", text.c_str(), result, seconds);
-    } else {
-        gLogSQL.log("Exec %s  -->%i [%.3lf sec]", text.c_str(), result, seconds);
-    }
 }
 
 void Database::_throwQueryException(const Exception& exception) {
@@ -105,21 +127,20 @@ void Database::endTransaction() {
     gWarn.log("<<<< ABORTED TRANSACTION");
     mPostTimer.stop();
     mChanges.reset();
-    mUndoneDeletes.clear();
+    mDeletedRows.forgetAllUndone();
 }
 
 void Database::commit() {
     try {
         runWithRetry(SQLText("commit"));
     } catch (...) {
-        // A commit that meets a lock leaves the transaction open. Its changes stay pending, so
-        // what was deleted and is not is to be announced as deleted all the same.
-        mUndoneDeletes.insert(mUndoneDeletes.end(), mDeletes.begin(), mDeletes.end());
+        // A commit that meets a lock leaves the transaction open. Its changes stay pending.
+        mDeletedRows.failCommit();
         rollBack();
         throw;
     }
     mJournal.clear();
-    mDeletes.clear();
+    mDeletedRows.endTransaction();
     gLogSQL.log("<<<< END TRANSACTION (%.3f sec)", Clock::current().now() - mTransactionStart);
     _postChangeNotification();
 }
@@ -127,31 +148,14 @@ void Database::commit() {
 void Database::rollBack() {
     const Foundation::AutoreleasePool pool;
     sqlite3_exec(mDB, "rollback", nullptr, nullptr, nullptr);
-    mDeletes.clear();
+    mDeletedRows.endTransaction();
     mJournal.rollBack(mTables);
-}
-
-bool Database::passesIntegrityCheck() {
-    bool passes = false;
-    for (Cursor cursor(this, "pragma integrity_check"); cursor.hasRow(); cursor.nextRow()) {
-        const char* text = cursor.cStringColumn(0);
-        passes = text && std::strcmp(text, "ok") == 0;
-    }
-    return passes;
-}
-
-void Database::reportIntegrity() {
-    gWarn.log("*** SQLite integrity check failed! Details:");
-    for (Cursor cursor(this, "pragma integrity_check"); cursor.hasRow(); cursor.nextRow()) {
-        gWarn.log("    %s", cursor.cStringColumn(0));
-    }
-    _throwQueryException(Exception(SQLITE_CORRUPT, "integrity check failed"));
 }
 
 void Database::integrityCheck() {
     gLog.log("*** Performing integrity_check on database");
     try {
-        if (!passesIntegrityCheck()) reportIntegrity();
+        if (!passesIntegrityCheck(*this)) reportIntegrity(*this);
         gLog.log("*** Passed integrity_check on database");
     } catch (const Exception& exception) {
         gLog.log("*** SQLite integrity check failed -- exception %s", exception.what());

@@ -226,7 +226,7 @@ void Database::closeConnection() {
     while (mStatements)
         mStatements->invalidate();
     mJournal.clear();
-    mDeletes.clear();
+    mDeletedRows.endTransaction();
     sqlite3_close(std::exchange(mDB, nullptr));
     mLocation = nullptr;
     mTransactionDepth = 0;
@@ -239,7 +239,7 @@ void Database::stopTimers() {
     mSaveTimer.stop();
     mPostTimer.stop();
     mFatalTimer.stop();
-    mCursorTimer.stop();
+    mCursors.stop();
 }
 
 }  // namespace SQLite

@@ -56,7 +56,7 @@ void Table::_deleteRow(Row* row) {
         }
         mDeleteQuery->bindRowID(1, row->mRowID);
         mDeleteQuery->execute();
-        mDatabase->_noteDelete(this, row->mRowID);
+        if (mDatabase->isInTransaction()) mDatabase->deletedRows().note(this, row->mRowID);
     }
     _uncacheRow(row);
 }
@@ -164,7 +164,7 @@ void Table::applyChange(const String* key, std::int64_t action, bool unloadUpdat
     const auto entry = mRows.find(rowID);
     if (entry == mRows.end()) return;
     if (action == ChangeAction::kUpdate) return unloadRow(entry->second);
-    if (!unloadUpdated && mDatabase->_isUndoneDelete(this, rowID)) return;
+    if (!unloadUpdated && mDatabase->deletedRows().isUndone(this, rowID)) return;
     forgetRow(entry);
 }
 

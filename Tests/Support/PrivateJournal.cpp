@@ -1,37 +1,22 @@
 #include "Support/PrivateJournal.h"
 
+#include "Support/EnterNamespace.h"
+
 #include <endian.h>
 #include <sched.h>
 #include <sys/mount.h>
 #include <sys/socket.h>
 #include <sys/un.h>
-#include <unistd.h>
 
 #include <cerrno>
 #include <cstdint>
 #include <cstring>
 #include <filesystem>
-#include <fstream>
 #include <stdexcept>
 
 namespace Support {
 
 namespace {
-
-bool write(const char* path, const std::string& text) {
-    std::ofstream out(path);
-    out << text << std::flush;
-    return static_cast<bool>(out);
-}
-
-bool enterNamespace() {
-    if (unshare(CLONE_NEWNS) == 0) return true;
-    const std::string user = std::to_string(geteuid());
-    const std::string group = std::to_string(getegid());
-    return unshare(CLONE_NEWUSER | CLONE_NEWNS) == 0 && write("/proc/self/setgroups", "deny") &&
-           write("/proc/self/uid_map", "0 " + user + " 1") &&
-           write("/proc/self/gid_map", "0 " + group + " 1");
-}
 
 bool mountOwnRun() {
     return mount(nullptr, "/", nullptr, MS_REC | MS_PRIVATE, nullptr) == 0 &&
@@ -76,7 +61,7 @@ std::map<std::string, std::string> parse(std::string_view message) {
 }  // namespace
 
 PrivateJournal::PrivateJournal() {
-    if (enterNamespace() && mountOwnRun()) {
+    if (enterNamespace(CLONE_NEWNS) != EnteredNamespace::kNot && mountOwnRun()) {
         mSocket = listenAt("/run/systemd/journal/socket");
     } else {
         mProblem = std::string("no mount namespace: ") + std::strerror(errno);
