@@ -22,6 +22,11 @@ double secondsOf(Body&& body) {
     return std::chrono::duration<double>(std::chrono::steady_clock::now() - start).count();
 }
 
+inline double median(std::vector<double> times) {
+    std::sort(times.begin(), times.end());
+    return times[times.size() / 2];
+}
+
 /// The medians of what `measured` and `floor` take, each run `rounds` times by turns, so that what
 /// else the machine does meets both alike.
 struct Comparison {
@@ -43,10 +48,6 @@ Comparison compare(Measured&& measured, Floor&& floor, int rounds = 15, Prepare&
         a.push_back(secondsOf(measured));
         b.push_back(secondsOf(floor));
     }
-    const auto median = [](std::vector<double>& times) {
-        std::sort(times.begin(), times.end());
-        return times[times.size() / 2];
-    };
     return {median(a), median(b)};
 }
 
