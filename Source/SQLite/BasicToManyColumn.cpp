@@ -37,6 +37,13 @@ bool BasicToManyColumn::remove(Row* row) {
     return true;
 }
 
+void BasicToManyColumn::removeSaved(Row* row) {
+    const Ref<Row> kept = row;
+    if (!remove(row)) return;
+    Database* database = row->getTable()->getDatabase();
+    if (database->isInTransaction()) database->journal().noteChild(*mRow, *this, *row);
+}
+
 void BasicToManyColumn::saveChanges(Table* destination) {
     if (mNewRows.empty()) return;
     Database* database = destination->getDatabase();

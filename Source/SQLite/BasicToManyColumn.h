@@ -20,6 +20,8 @@ class BasicToManyColumn : public Column {
     void add(Row* row);
     /// Whether the row was there.
     bool remove(Row* row);
+    /// Takes a row out that has been saved by itself. It comes back if that save is rolled back.
+    void removeSaved(Row* row);
     /// Saves the rows into that table, each of which needs its owner's ID: behind the owner's save.
     void saveChanges(Table* destination);
 

@@ -29,6 +29,10 @@ void RowJournal::noteChildren(Row& owner, BasicToManyColumn& column) {
     mChildren.push_back({&owner, &column, column.getNewRows()});
 }
 
+void RowJournal::noteChild(Row& owner, BasicToManyColumn& column, Row& child) {
+    mChildren.push_back({&owner, &column, {&child}});
+}
+
 void RowJournal::clear() {
     for (Link& link : mLinks) {
         if (link.column) link.column->_forgetLink();
@@ -72,8 +76,9 @@ void RowJournal::restoreLinks() {
 }
 
 void RowJournal::restoreChildren() {
-    for (const Children& children : mChildren) {
-        callGuarded(kRollBack, [&] { children.column->_restore(children.rows); });
+    // Each puts its rows first, so the last comes first.
+    for (auto children = mChildren.rbegin(); children != mChildren.rend(); ++children) {
+        callGuarded(kRollBack, [&] { children->column->_restore(children->rows); });
     }
 }
 

@@ -38,6 +38,8 @@ class RowJournal : Foundation::Uncopyable {
     Link* noteLink(BasicToOneColumn& column, Row& target, bool retains);
     /// Notes the rows that a to-many column is about to forget.
     void noteChildren(Row& owner, BasicToManyColumn& column);
+    /// Notes one of them that it is about to forget.
+    void noteChild(Row& owner, BasicToManyColumn& column, Row& child);
 
     /// The transaction is committed.
     void clear();
