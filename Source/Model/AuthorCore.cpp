@@ -1,14 +1,33 @@
 #include "Model/AuthorCore.h"
 
+#include "Foundation/URL.h"
 #include "Model/PublicObjects.h"
+#include "SQLite/Database.h"
+#include "SQLite/QueryOf.h"
 
 namespace Orvane {
 
+using Foundation::IsEqual;
+using Foundation::Returner;
+using Foundation::String;
 using SQLite::column;
 
 const char AuthorCore::kSchema[] =
     "rowID integer not null unique primary key, name text, email text, url text, "
     "contactBookUid text";
+
+namespace {
+
+/// For a comparison in which null and empty are the same.
+void bindText(SQLite::Query& query, int index, const String* text) {
+    if (text) {
+        query.bind(index, text);
+    } else {
+        query.bind(index, "", false);
+    }
+}
+
+}  // namespace
 
 const SQLite::ColumnList& AuthorCore::columnList() {
     static const SQLite::ColumnList sColumns = {
@@ -22,6 +41,35 @@ const SQLite::ColumnList& AuthorCore::columnList() {
 
 OVObject* AuthorCore::createOVObject() {
     return PublicObjects::makeFor(this);
+}
+
+bool AuthorCore::isEmpty() const {
+    return String::isEmpty(mName) && String::isEmpty(mEmail) && mURL.getValue() == nullptr;
+}
+
+Returner<AuthorCore> AuthorCore::findInDatabase() {
+    if (getTable()) return Returner<AuthorCore>::retained(this);
+    SQLite::TableOf<AuthorCore>* table = SQLite::TableOf<AuthorCore>::instance();
+    if (!table->getDatabase()->isOpen()) return nullptr;
+    static auto* const sQuery = new SQLite::QueryOf<AuthorCore>(
+        table,
+        "select rowID from Authors  where ifnull(name,'')=? and ifnull(email,'')=?"
+        "        and ifnull(URL,'')=?  limit 1");
+    bindText(*sQuery, 1, mName);
+    bindText(*sQuery, 2, mEmail);
+    if (const Foundation::URL* url = mURL) {
+        sQuery->bind(3, url);
+    } else {
+        sQuery->bind(3, "", false);
+    }
+    return sQuery->firstRow();
+}
+
+bool IsContentEqual(const AuthorCore* a, const AuthorCore* b) {
+    if (a == b) return true;
+    if (!a || !b) return false;
+    return a->isEqual(b) || (IsEqual(a->mName, b->mName) && IsEqual(a->mEmail, b->mEmail) &&
+                             IsEqual(a->mURL, b->mURL));
 }
 
 }  // namespace Orvane

@@ -26,11 +26,21 @@ class AuthorCore : public CoreOf<AuthorCore> {
 
     OVObject* createOVObject() override;
 
+    /// Whether it says nothing of anybody: no name, no email and no URL.
+    bool isEmpty() const;
+    /// This row if it is in a table; else the row of the file that has the same name, email and
+    /// URL, where null and empty are the same. Null if there is none, and if the database is
+    /// closed.
+    Foundation::Returner<AuthorCore> findInDatabase();
+
     SQLite::ScalarColumn<Foundation::String> mName{this};
     SQLite::ScalarColumn<Foundation::String> mEmail{this};
     SQLite::ScalarColumn<Foundation::URL> mURL{this};
     /// A contact of the contacts service.
     SQLite::ScalarColumn<Foundation::String> mContactBookUID{this};
 };
+
+/// Whether the two are one row, or agree in name, email and URL. False if one alone is null.
+bool IsContentEqual(const AuthorCore* a, const AuthorCore* b);
 
 }  // namespace Orvane

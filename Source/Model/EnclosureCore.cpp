@@ -1,10 +1,14 @@
 #include "Model/EnclosureCore.h"
 
+#include "Foundation/Logger.h"
+#include "Foundation/TypeName.h"
+#include "Foundation/URL.h"
 #include "Model/EntryCore.h"
 #include "Model/PublicObjects.h"
 
 namespace Orvane {
 
+using Foundation::Ref;
 using SQLite::column;
 
 const char EnclosureCore::kSchema[] =
@@ -37,6 +41,35 @@ const SQLite::ColumnList& EnclosureCore::columnList() {
 
 OVObject* EnclosureCore::createOVObject() {
     return PublicObjects::makeFor(this);
+}
+
+EntryCore* EnclosureCore::getEntry() const {
+    return mEntry.getValue();
+}
+
+void EnclosureCore::setEntry(EntryCore* entry) {
+    const Ref<EntryCore> old = mEntry.getValue();
+    if (Foundation::IsEqual(old.get(), entry)) return;
+    mEntry.setValue(entry);
+    if (old.get()) old->removeFromEnclosures(this);
+    if (entry) entry->addToEnclosures(this);
+}
+
+EnclosureCore* EnclosureCore::matchingEnclosureFrom(
+    const Foundation::ArrayOf<EnclosureCore>* enclosures) const {
+    for (EnclosureCore* other : *enclosures) {
+        if (Foundation::IsEqual(mURL, other->mURL)) return other;
+    }
+    return nullptr;
+}
+
+Foundation::StringReturner EnclosureCore::toString() const {
+    if (!mURL.isLoaded() || !mMIMEType.isLoaded() || !mLength.isLoaded()) {
+        return CoreOf::toString();
+    }
+    return Foundation::String::stringWithFormat(
+        "%s[<%@> %@ %.0fKB]", Foundation::getTypeName(typeid(*this)), mURL.getValue(),
+        mMIMEType.getValue(), static_cast<double>(mLength.getValue()) / 1024);
 }
 
 }  // namespace Orvane

@@ -36,6 +36,16 @@ class EnclosureCore : public CoreOf<EnclosureCore> {
 
     OVObject* createOVObject() override;
 
+    EntryCore* getEntry() const;
+    /// Each side of the link sets the other. The entry, which may be null, must outlive the link if
+    /// it is not stored.
+    void setEntry(EntryCore* entry);
+    /// The first of a list that has the same URL, or null.
+    EnclosureCore* matchingEnclosureFrom(
+        const Foundation::ArrayOf<EnclosureCore>* enclosures) const;
+    /// "EnclosureCore[<url> type sizeKB]", if that is in memory.
+    Foundation::StringReturner toString() const override;
+
     SQLite::ToOneColumn<EntryCore, true> mEntry{this};
     SQLite::ScalarColumn<Foundation::URL> mURL{this};
     SQLite::ScalarColumn<Foundation::String> mMIMEType{this};

@@ -1,5 +1,8 @@
 #include "Model/EntryCore.h"
 
+#include "Foundation/AssertionFailure.h"
+#include "Foundation/Logger.h"
+#include "Foundation/NetException.h"
 #include "Model/AuthorCore.h"
 #include "Model/ContentCore.h"
 #include "Model/EnclosureCore.h"
@@ -8,6 +11,10 @@
 
 namespace Orvane {
 
+using Foundation::Date;
+using Foundation::Ref;
+using Foundation::Returner;
+using Foundation::String;
 using SQLite::column;
 
 const char EntryCore::kSchema[] =
@@ -81,6 +88,45 @@ const SQLite::ColumnList& EntryCore::columnList() {
 
 OVObject* EntryCore::createOVObject() {
     return PublicObjects::makeFor(this);
+}
+
+Returner<EntryCore> EntryCore::getEntryWithIdentifier(String* identifier) {
+    OV_ASSERT_AS(identifier != nullptr, "identifier");
+    static auto* const sQuery =
+        SQLite::TableOf<EntryCore>::instance()->rowsWhere("identifier = ?").release();
+    sQuery->bind(1, identifier);
+    return sQuery->firstRow();
+}
+
+Returner<EntryCore> EntryCore::createGhostEntry(String* identifier) {
+    Ref<EntryCore> ghost = Returner<EntryCore>::adopted(new EntryCore);
+    ghost->mIdentifier.setValue(identifier);
+    ghost->mLocalDateCreated.setValue(Date::now());
+    ghost->mCurrent.setValue(true);
+    return ghost;
+}
+
+void EntryCore::useDefaultTimePublished(Date* date, Foundation::TimeZone* zone) {
+    if (!mDatePublished.getValue()) mDatePublished.setValue(date);
+    if (!mTimeZonePublished.getValue()) mTimeZonePublished.setValue(zone);
+}
+
+Date* EntryCore::getDateForDisplay() const {
+    if (Date* published = mDatePublished) return published;
+    if (Date* updated = mDateUpdated) return updated;
+    return mLocalDateCreated;
+}
+
+std::uint64_t EntryCore::getSortValue() const {
+    return getRowID() != 0 ? static_cast<std::uint64_t>(getRowID()) : mSortValue;
+}
+
+void EntryCore::saveChanges() {
+    const Ref<EntryCore> self = this;
+    CoreOf::saveChanges();
+    // A feed that is not in memory has no new entries.
+    FeedCore* feed = SQLite::TableOf<FeedCore>::instance()->cachedRowWithID(mFeed.getRowID());
+    if (feed) feed->mEntries.removeSaved(this);
 }
 
 }  // namespace Orvane

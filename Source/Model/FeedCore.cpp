@@ -1,5 +1,8 @@
 #include "Model/FeedCore.h"
 
+#include "Foundation/AssertionFailure.h"
+#include "Foundation/Logger.h"
+#include "Foundation/URL.h"
 #include "Model/EntryCore.h"
 #include "Model/SubscriptionCore.h"
 
@@ -62,6 +65,29 @@ const SQLite::ColumnList& FeedCore::columnList() {
 
 OVObject* FeedCore::createOVObject() {
     return nullptr;
+}
+
+Foundation::String* FeedCore::getIdentifier() const {
+    if (Foundation::String* stored = mIdentifier) return stored;
+    const Foundation::URL* url = mURL;
+    OV_ASSERT_AS(url != nullptr, "url");
+    const Foundation::Ref<Foundation::Data> text = url->getData();
+    Foundation::String* identifier = text->SHA1HashString();
+    gLogSub.log("\t%@: set ident %@ based on \"%@\"", this, identifier, url);
+    // Keeping what follows from the URL does not change what the feed is.
+    if (isChangeable()) const_cast<FeedCore*>(this)->mIdentifier.setValue(identifier);
+    return identifier;
+}
+
+void FeedCore::addToEntries(EntryCore* entry) {
+    mEntries.add(entry);
+    entry->setFeed(this);
+}
+
+void FeedCore::removeFromEntries(EntryCore* entry) {
+    const Foundation::Ref<EntryCore> kept = entry;
+    mEntries.remove(entry);
+    entry->setFeed(nullptr);
 }
 
 }  // namespace Orvane

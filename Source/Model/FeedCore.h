@@ -57,6 +57,13 @@ class FeedCore : public CoreOf<FeedCore> {
     /// None: clients see a feed by its subscription.
     OVObject* createOVObject() override;
 
+    /// The SHA-1 of the feed's URL as it was first stored, kept where the row may be changed. Valid
+    /// until the current pool drains. Throws `AssertionFailure` for a feed without a URL.
+    Foundation::String* getIdentifier() const;
+    /// Each side of the link sets the other.
+    void addToEntries(EntryCore* entry);
+    void removeFromEntries(EntryCore* entry);
+
     SQLite::ScalarColumn<Foundation::String> mIdentifier{this};  ///< a hash
     SQLite::ScalarColumn<Foundation::String> mID{this};          ///< the document's
     SQLite::ScalarColumn<Foundation::String> mTitle{this};
