@@ -67,8 +67,12 @@ class Table : Foundation::Uncopyable {
     /// What has changed, here or elsewhere: is announced in this process.
     virtual void _postLocalChangeNotification(Foundation::Dictionary* changes);
 
-    /// Makes the table with its indexes and triggers, if there is none of its name.
+    // These throw `Exception`, with the code 23 where the file may not be changed.
+
+    /// Makes the table with its indexes and triggers, which may be null. One of its name is left as
+    /// it is, with what indexes and triggers it has.
     void create(const char* columns, const IndexSpec* indexes, const TriggerSpec* triggers);
+    /// An index of that name is left as it is.
     void addIndex(const char* name, const char* columns);
     void addColumn(const char* name, const char* declaration);
     /// Throws `Exception` with the code 23 unless rows may be changed.
@@ -88,7 +92,7 @@ class Table : Foundation::Uncopyable {
     /// Whether a row is new or changed.
     bool isChanged();
     /// Saves new rows, in the order in which they were added, and then changed ones by ID, in one
-    /// transaction.
+    /// transaction. Throws `Exception`; all of them are then still to be saved.
     void saveRows();
     /// Forgets all rows, new ones too. Those that somebody holds live on.
     void uncacheRows();

@@ -121,9 +121,10 @@ TEST_F(DatabaseTest, ReadsOnlyFilesThatExist) {
 }
 
 TEST_F(DatabaseTest, IsClosedAfterAnOpenThatFails) {
-    const LogCapture log;
+    LogCapture log;
     Database other;
     EXPECT_EQ(codeOf([&] { other.open((directory / "no/such/folder").c_str(), true); }) & 0xFF, 14);
+    EXPECT_TRUE(log.contains("SQL Error: SQLITE_CANTOPEN[14.0]: unable to open database file"));
     EXPECT_FALSE(other.isOpen());
     EXPECT_EQ(other.getLocation(), nullptr);
     other.open(path.c_str(), true);
