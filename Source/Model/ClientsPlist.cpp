@@ -18,6 +18,7 @@
 namespace Orvane {
 
 using namespace Foundation;
+using SQLite::gLogTruth;
 
 namespace {
 
@@ -151,9 +152,12 @@ Returner<Dictionary> ClientsPlist::describeDatabase() {
 }
 
 Returner<Dictionary> ClientsPlist::read(URL* url) {
-    std::string error;
-    Ref<Dictionary> root = readDictionary(url, error);
-    if (!root) gWarn.log("Could not read %@ : %s", url, error);
+    std::string problem;
+    Ref<Dictionary> root = readDictionary(url, problem);
+    if (!root) {
+        gLogTruth.log("%@ : %s", url, problem);
+        gWarn.log("Could not read %@", url);
+    }
     return Returner<Dictionary>(std::move(root));
 }
 

@@ -2,17 +2,71 @@
 
 #include "Foundation/Clock.h"
 #include "Foundation/Dictionary.h"
+#include "Foundation/Guard.h"
 #include "Foundation/Logger.h"
+#include "Foundation/Switches.h"
 #include "Model/ClientsPlist.h"
 #include "Model/FeedCore.h"
+#include "Model/Migrations.h"
+#include "Model/OlderDatabase.h"
+#include "Model/Schema.h"
+#include "Model/TruthRestore.h"
+#include "SQLite/Database.h"
+#include "SQLite/Exception.h"
 #include "Utilities/FileSystem.h"
 #include "Utilities/FileUtils.h"
+
+#include <cstdlib>
 
 namespace Orvane {
 
 using namespace Foundation;
 using Compatibility::FileSystem;
+using SQLite::gDatabase;
 using SQLite::gLogTruth;
+
+namespace {
+
+/// Throws if the directory is not there and cannot be made.
+void createDirectory(URLReturner location) {
+    const Ref<URL> url = std::move(location);
+    NetError error;
+    if (FileUtils::createDirectory(url, error)) return;
+    gWarn.log("*** Could not create %@ : %@", url, error);
+    error.throwException();
+}
+
+URLReturner inStorage(const char* name, bool isDirectory) {
+    const Ref<URL> storage = FileSystem::getStorageURL();
+    const Ref<String> component = String::string(name);
+    return storage->byAppending(component, isDirectory);
+}
+
+/// Moves what is at `name` in the storage, if it is there, to `location`.
+void moveIfThere(const char* name, bool isDirectory, URL* location) {
+    const Ref<URL> from = inStorage(name, isDirectory);
+    NetError error;
+    if (FileUtils::exists(from) && !FileUtils::move(from, location, error)) {
+        gWarn.log("Could not move <%@> to <%@>: %@", from, location, error);
+    }
+}
+
+URLReturner withSuffix(const URL& url, const char* suffix) {
+    const std::string path = url.getFileSystemRepresentation() + suffix;
+    return URL::urlWithFileSystemPath(path.c_str(), false);
+}
+
+/// True while it lives.
+class Flag : Uncopyable {
+ public:
+    explicit Flag(bool& flag) : mFlag(flag) { mFlag = true; }
+    ~Flag() { mFlag = false; }
+
+ private:
+    bool& mFlag;
+};
+
+}  // namespace
 
 MinistryOfTruth* MinistryOfTruth::instance() {
     static MinistryOfTruth sInstance;
@@ -20,6 +74,166 @@ MinistryOfTruth* MinistryOfTruth::instance() {
 }
 
 MinistryOfTruth::MinistryOfTruth() : mSaveTimer(this, &MinistryOfTruth::saveSubscriptions) {}
+
+void MinistryOfTruth::openDatabase() {
+    const AutoreleasePool pool;
+    gLogAgentVerbose.log("MinistryOfTruth::openDatabase beginning...");
+    const Ref<URL> file = FileSystem::getStorageDatabaseFile();
+    const bool exists = FileUtils::exists(file) || convertOldSeedDatabase();
+    createDirectories();
+    if (exists) {
+        openExistingDatabase();
+    } else {
+        openNewDatabase();
+    }
+    // What migrated or restored it is not announced.
+    gDatabase->setPostsNotifications(true);
+    mPostsNotifications = true;
+    if (OlderDatabase* older = OlderDatabase::current()) older->checkIn(!exists);
+    gLogAgentVerbose.log("MinistryOfTruth::openDatabase finished.");
+}
+
+void MinistryOfTruth::openExistingDatabase() {
+    Ref<String> reason;
+    try {
+        openDBFile();
+        if (checkDatabaseSchema()) {
+            // Not before: it fixes the mode of auto_vacuum.
+            gDatabase->useWriteAheadLog();
+        } else {
+            reason = String::string("Database schema way out of date");
+        }
+    } catch (const SQLite::Exception& exception) {
+        doWarnAboutException(&exception, "void Orvane::MinistryOfTruth::openDatabase()");
+        reason = String::string(exception.what());
+    }
+    const Ref<URL> plist = getClientPListURL();
+    if (reason) {
+        recoverBrokenDatabase(reason);
+    } else if (!FileUtils::exists(plist)) {
+        saveSubscriptionsSoon();
+    }
+}
+
+void MinistryOfTruth::openNewDatabase() {
+    gLogAgent.log("No database exists -- opening and initializing a new one");
+    openDBFile();
+    initializeDatabase();
+}
+
+void MinistryOfTruth::openDBFile() {
+    SQLite::Database::initialize();
+    const Ref<URL> file = FileSystem::getStorageDatabaseFile();
+    gDatabase->open(file.get(), true);
+}
+
+void MinistryOfTruth::initializeDatabase() {
+    gLogAgent.log("Initializing new database...");
+    Schema::createDatabase([this] { restore(); });
+    if (GetBoolEnv("OVAgentQuitAfterRecovery")) {
+        gWarn.log("Agent exiting (OVAgentQuitAfterRecovery is set)");
+        std::exit(1);
+    }
+}
+
+void MinistryOfTruth::restore() {
+    const Flag restoring(mRestoring);
+    restoreSubscriptions();
+    TruthRestore::restoreEntries();
+}
+
+bool MinistryOfTruth::restoreSubscriptions() {
+    const Ref<URL> url = getClientPListURL();
+    if (!FileUtils::exists(url)) return false;
+    gLogTruth.log("Restoring Client/Subscription/Feed tables from plist...");
+    Ref<Dictionary> root;
+    callGuarded("bool Orvane::MinistryOfTruth::restoreSubscriptions()",
+                [&] { root = ClientsPlist::read(url); });
+    if (!root) return false;
+    TruthRestore::insertSubscriptions(root);
+    return true;
+}
+
+bool MinistryOfTruth::checkDatabaseSchema() {
+    int version = gDatabase->getUserVersion();
+    int major = version / 10000;
+    const int minor = version % 10000;
+    if (major == 0) {
+        major = 1;
+        version = 10000 + minor;
+        gDatabase->setUserVersion(version);
+    }
+    gLogAgentVerbose.log("Database userVersion=%i; that's %i/%i", version, major, minor);
+    if (major != Schema::kMajorVersion) {
+        gWarn.log(
+            "Database is too old (v%i on disk) vs. (v%i in framework): have to delete & recreate "
+            "database",
+            version, Schema::kVersion);
+        return false;
+    }
+    if (minor < Migrations::kOldestMinorVersion) {
+        gWarn.log("No migration path from Orvane database v%i to v%i.", version, Schema::kVersion);
+        return false;
+    }
+    if (minor > Schema::kMinorVersion) {
+        gWarn.log(
+            "Database on disk (v%i) is newer than what I know (v%i), but I think I can still use "
+            "it.",
+            version, Schema::kVersion);
+        return true;
+    }
+    if (minor == Schema::kMinorVersion) return true;
+    const double start = Clock::current().now();
+    Migrations::run(minor);
+    gLog.log("Migrating database schema from %d.%d to %d.%d took %.3f seconds.",
+             Schema::kMajorVersion, minor, Schema::kMajorVersion, Schema::kMinorVersion,
+             Clock::current().now() - start);
+    return true;
+}
+
+void MinistryOfTruth::createDirectories() {
+    createDirectory(FileSystem::getStorageBaseURL());
+    createDirectory(FileSystem::getStorageURL());
+    createDirectory(FileSystem::getStorageDatabaseURL());
+    createDirectory(FileSystem::getStorageTruthURL());
+}
+
+/// The database goes last, so that one that was cut short is taken up again; and not before its
+/// journal, without which it may be half of something.
+bool MinistryOfTruth::convertOldSeedDatabase() {
+    const Ref<URL> old = inStorage("Database.sqlite3", false);
+    if (!FileUtils::exists(old)) return false;
+    createDirectory(FileSystem::getStorageDatabaseURL());
+    const Ref<URL> truth = FileSystem::getStorageTruthURL();
+    moveIfThere("RawFeeds", true, truth);
+    const Ref<URL> file = FileSystem::getStorageDatabaseFile();
+    const Ref<URL> journal = withSuffix(*file, "-journal");
+    moveIfThere("Database.sqlite3-journal", false, journal);
+    moveIfThere("Database.sqlite3", false, file);
+    return FileUtils::exists(file);
+}
+
+void MinistryOfTruth::recoverBrokenDatabase(String*) {
+    const AutoreleasePool pool;
+    gWarn.log("*** DATABASE IS BROKEN/STUCK: Moving aside and rebuilding ***");
+    deleteDatabase();
+    openDBFile();
+    initializeDatabase();
+    // It is another connection than before.
+    if (mPostsNotifications) gDatabase->setPostsNotifications(true);
+    gDatabase->postReplacedNotification();
+}
+
+void MinistryOfTruth::deleteDatabase() {
+    gDatabase->close(false);
+    const Ref<URL> directory = FileSystem::getStorageDatabaseURL();
+    NetError error;
+    if (FileUtils::exists(directory) && !FileUtils::moveToTrash(directory, error)) {
+        gWarn.log("Unable to move <%@> to trash: %@", directory, error);
+        error.throwException();
+    }
+    createDirectory(FileSystem::getStorageDatabaseURL());
+}
 
 void MinistryOfTruth::saveSubscriptionsSoon() {
     if (mSaveTimer.isRunning()) return;

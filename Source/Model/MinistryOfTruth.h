@@ -13,15 +13,30 @@ class FeedCore;
 /// made anew. What is needed for that stands outside of it: the file of clients and subscriptions,
 /// and the documents and old entries of the feeds, the "truth".
 ///
+///     Orvane/Database/Database.sqlite3   the database; its directory goes as a whole
+///     Orvane/Clients.plist               see `ClientsPlist`
+///     Orvane/Feeds/<feed>.xml            a feed's last document
+///     Orvane/Feeds/<feed>/<entry>.xml    an entry that is no longer in it
+///
 /// Only the agent uses it, on its main thread.
 class MinistryOfTruth : Foundation::Uncopyable {
  public:
+    using String = Foundation::String;
     using URL = Foundation::URL;
 
     static constexpr double kSaveDelaySeconds = 5.0;
 
     /// Made on first use, and destroyed at the process's end.
     static MinistryOfTruth* instance();
+
+    /// Opens the database of the process for writing, and makes it, migrates it or makes it anew as
+    /// need be. From then on its changes are announced. To be called once.
+    ///
+    /// Throws `NetException` if a directory cannot be made, or a database that is broken not be
+    /// moved away, and what making it anew throws: that is taken up again the next time.
+    void openDatabase();
+    /// Moves the database of the process away and makes it anew. Throws as `openDatabase` does.
+    void recoverBrokenDatabase(String* reason);
 
     /// Saves the file of clients and subscriptions in 5 seconds, or when an earlier request said.
     void saveSubscriptionsSoon();
@@ -42,8 +57,20 @@ class MinistryOfTruth : Foundation::Uncopyable {
  private:
     MinistryOfTruth();
 
+    void openExistingDatabase();
+    void openNewDatabase();
+    void openDBFile();
+    void initializeDatabase();
+    void restore();
+    bool checkDatabaseSchema();
+    void createDirectories();
+    void deleteDatabase();
+    bool restoreSubscriptions();
+    bool convertOldSeedDatabase();
+
     bool mRestoring = false;
     Foundation::Timer<MinistryOfTruth> mSaveTimer;
+    bool mPostsNotifications = false;
 };
 
 }  // namespace Orvane

@@ -198,13 +198,17 @@ TEST_F(ClientsPlistTest, StaysAsItWasOnAFullDisk) {
     EXPECT_THAT(names(), ElementsAre("Clients.plist"));
 }
 
-TEST_F(ClientsPlistTest, StaysAsItWasIfItCannotBeWrittenOrKept) {
+TEST_F(ClientsPlistTest, IsNotReplacedIfItCanNeitherBeReadNorKept) {
     writeFile("Clients.plist", "unreadable");
-    fs::permissions(storage(), fs::perms::owner_read | fs::perms::owner_exec);
+    fs::permissions(storage() / "Clients.plist", fs::perms::all);
+    fs::permissions(base.path(), fs::perms::all);
+    fs::permissions(storage(), static_cast<fs::perms>(0555));
     {
         const Support::OrdinaryFileAccess ordinary;
         EXPECT_FALSE(write("new"));
     }
     fs::permissions(storage(), fs::perms::owner_all);
+    EXPECT_EQ(log.count("Could not keep file://"), 1);
     EXPECT_EQ(readFile("Clients.plist"), "unreadable");
+    EXPECT_THAT(names(), ElementsAre("Clients.plist"));
 }
