@@ -1,8 +1,11 @@
 #pragma once
 
+#include "Foundation/ProcessInfo.h"
 #include "Model/CoreOf.h"
 #include "SQLite/ScalarColumn.h"
 #include "SQLite/ToManyColumn.h"
+
+#include <optional>
 
 namespace Orvane {
 
@@ -28,12 +31,24 @@ class ClientCore : public CoreOf<ClientCore> {
     /// The columns in the order of the table.
     static const SQLite::ColumnList& columnList();
 
+    /// Whether the application runs.
+    bool isProcessRunning() const;
+    /// Whether the client has not been in use for so long that nothing is done for it.
+    bool isDormant() const;
+    /// The client's subscription of a feed, or its settings for ID 0; null if there is none.
+    Foundation::Returner<SubscriptionCore> _getSubscription(SQLite::RowID feedRowID) const;
+
     OVObject* createOVObject() override;
 
     SQLite::ScalarColumn<Foundation::String> mSignature{this};  ///< the bundle identifier
     SQLite::ScalarColumn<bool> mPrivate{this};                  ///< only it itself may open it
     SQLite::ScalarColumn<Foundation::Date> mDateUsed{this};
     SQLite::ToManyColumn<SubscriptionCore> mSubscriptions{this, "Client"};
+
+ private:
+    static constexpr double kDormantAfterSeconds = 1209600.0;
+
+    mutable std::optional<Foundation::ProcessInfo> mProcessInfo;  ///< made on first use
 };
 
 }  // namespace Orvane

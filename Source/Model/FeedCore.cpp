@@ -1,14 +1,24 @@
 #include "Model/FeedCore.h"
 
 #include "Foundation/AssertionFailure.h"
+#include "Foundation/Data.h"
 #include "Foundation/Logger.h"
 #include "Foundation/URL.h"
+#include "Model/AgentLink.h"
 #include "Model/EntryCore.h"
+#include "Model/MinistryOfTruth.h"
 #include "Model/SubscriptionCore.h"
+#include "SQLite/Transaction.h"
 
 namespace Orvane {
 
+using Foundation::NetError;
+using Foundation::Ref;
+using Foundation::String;
 using SQLite::column;
+using SQLite::RowIterator;
+using SQLite::TableOf;
+using SQLite::Transaction;
 
 const char FeedCore::kSchema[] =
     "rowID integer not null unique primary key, identifier text unique, id text, title text, "
@@ -63,20 +73,40 @@ const SQLite::ColumnList& FeedCore::columnList() {
     return sColumns;
 }
 
+FeedCore::~FeedCore() {
+    // What has an ID is pointed at by that.
+    if (getRowID() != 0) return;
+    // Who still holds one of the new rows must not find this behind it.
+    for (const Ref<SQLite::Row>& row : mEntries.getNewRows()) {
+        static_cast<EntryCore&>(*row).mFeed.setValue(nullptr);
+    }
+    for (const Ref<SQLite::Row>& row : mSubscriptions.getNewRows()) {
+        static_cast<SubscriptionCore&>(*row).mFeed.setValue(nullptr);
+    }
+}
+
 OVObject* FeedCore::createOVObject() {
     return nullptr;
 }
 
-Foundation::String* FeedCore::getIdentifier() const {
-    if (Foundation::String* stored = mIdentifier) return stored;
-    const Foundation::URL* url = mURL;
+String* FeedCore::getIdentifier() const {
+    if (String* stored = mIdentifier.getValue()) return stored;
+    const Foundation::URL* url = mURL.getValue();
     OV_ASSERT_AS(url != nullptr, "url");
-    const Foundation::Ref<Foundation::Data> text = url->getData();
-    Foundation::String* identifier = text->SHA1HashString();
+    const Ref<Foundation::Data> bytes = url->getData();
+    const Ref<String> identifier = bytes->SHA1HashString();
     gLogSub.log("\t%@: set ident %@ based on \"%@\"", this, identifier, url);
-    // Keeping what follows from the URL does not change what the feed is.
+    // What is computed is what is stored: keeping it does not change what the row is.
     if (isChangeable()) const_cast<FeedCore*>(this)->mIdentifier.setValue(identifier);
-    return identifier;
+    return Foundation::StringReturner(identifier);
+}
+
+void FeedCore::preloaded() {
+    getIdentifier();
+}
+
+RowIterator<EntryCore> FeedCore::getEntries(const char* condition) const {
+    return RowIterator<EntryCore>(mEntries, condition);
 }
 
 void FeedCore::addToEntries(EntryCore* entry) {
@@ -85,9 +115,49 @@ void FeedCore::addToEntries(EntryCore* entry) {
 }
 
 void FeedCore::removeFromEntries(EntryCore* entry) {
-    const Foundation::Ref<EntryCore> kept = entry;
+    const Ref<EntryCore> kept = entry;
     mEntries.remove(entry);
     entry->setFeed(nullptr);
+}
+
+RowIterator<SubscriptionCore> FeedCore::getSubscriptions(const char* condition) const {
+    return RowIterator<SubscriptionCore>(mSubscriptions, condition);
+}
+
+void FeedCore::addToSubscriptions(SubscriptionCore* subscription) {
+    mSubscriptions.add(subscription);
+    subscription->setFeed(this);
+}
+
+void FeedCore::removeFromSubscriptions(SubscriptionCore* subscription) {
+    const Ref<SubscriptionCore> kept = subscription;
+    mSubscriptions.remove(subscription);
+    subscription->setFeed(nullptr);
+}
+
+void FeedCore::updateUnreadCounts() {
+    if (!getTable() || MinistryOfTruth::instance()->isRestoring()) return;
+    const Transaction transaction(true);
+    TableOf<EntryCore>::instance()->saveRows();
+    for (auto subscription = getSubscriptions(nullptr); subscription.hasRow();
+         subscription.nextRow()) {
+        if (subscription->updateUnreadCount()) subscription->saveChanges();
+    }
+}
+
+NetError FeedCore::getLastError() const {
+    return {mLastErrorDomain.getValue(), mLastErrorCode.getValue()};
+}
+
+void FeedCore::setLastError(NetError error) {
+    mLastErrorDomain.setValue(error.domain);
+    mLastErrorCode.setValue(error.code);
+}
+
+void FeedCore::public_setLogin(String* login) {
+    if (isChangeable()) return mLogin.setValue(login);
+    AgentLink::current().setLogin(this, login);
+    mLogin.unload();
 }
 
 }  // namespace Orvane

@@ -1,17 +1,39 @@
 #pragma once
 
+#include "Foundation/NetError.h"
+#include "Foundation/NotificationNames.h"
 #include "Model/CoreOf.h"
+#include "Model/FeedRefresher.h"
+#include "SQLite/RowIterator.h"
 #include "SQLite/ScalarColumn.h"
 #include "SQLite/ToManyColumn.h"
+
+#include <limits>
 
 namespace Orvane {
 
 class EntryCore;
 class SubscriptionCore;
 
-/// A source of entries, which subscriptions share: a row of "Feeds".
+/// A source of entries, which subscriptions share: a row of "Feeds". It has its last document, and
+/// the entries that have left that, in files outside of the database (the "truth"), owns the feeder
+/// that refreshes it, and takes all that belongs to it along when it is deleted.
+///
+/// A feed in no table, as the parser makes it or an application uses it, is in memory alone.
 class FeedCore : public CoreOf<FeedCore> {
  public:
+    // Posted in the local centre with the feed as object. The info of the last one has
+    // "ErrorDomain" and "ErrorCode" if the refresh failed, and "DidChange" if it changed the feed.
+    static constexpr const Foundation::NotificationName& kWillRefreshNotification =
+        Foundation::NotificationNames::kFeedWillRefresh;
+    static constexpr const Foundation::NotificationName& kBeganUpdateLocalNotification =
+        Foundation::NotificationNames::kFeedBeganUpdate;
+    static constexpr const Foundation::NotificationName& kEndedUpdateLocalNotification =
+        Foundation::NotificationNames::kFeedEndedUpdate;
+
+    static constexpr double kRefreshNever = std::numeric_limits<double>::infinity();
+    static double sMinimumRefreshInterval;  ///< seconds, for all feeds of the process
+
     static constexpr const char* kTableName = "Feeds";
     static constexpr bool kRetainRows = true;
     static const char kSchema[];
@@ -54,15 +76,66 @@ class FeedCore : public CoreOf<FeedCore> {
     /// The columns in the order of the table.
     static const SQLite::ColumnList& columnList();
 
-    /// None: clients see a feed by its subscription.
-    OVObject* createOVObject() override;
+    ~FeedCore() override;
 
-    /// The SHA-1 of the feed's URL as it was first stored, kept where the row may be changed. Valid
-    /// until the current pool drains. Throws `AssertionFailure` for a feed without a URL.
+    /// The SHA-1 of the URL that the feed was first stored with, in 40 hexadecimal digits.
     Foundation::String* getIdentifier() const;
-    /// Each side of the link sets the other.
+    void preloaded() override;
+
+    // What points at the feed: all, or what meets a condition of SQL; see `BasicRowIterator`. Each
+    // side of a link sets the other.
+
+    SQLite::RowIterator<EntryCore> getEntries(const char* condition) const;
     void addToEntries(EntryCore* entry);
     void removeFromEntries(EntryCore* entry);
+    SQLite::RowIterator<SubscriptionCore> getSubscriptions(const char* condition) const;
+    void addToSubscriptions(SubscriptionCore* subscription);
+    void removeFromSubscriptions(SubscriptionCore* subscription);
+    /// Counts the unread entries of all subscriptions anew and saves what has changed. Does nothing
+    /// for a feed in memory, or while the database is restored.
+    void updateUnreadCounts();
+
+    // Refreshing.
+
+    /// The shortest interval of the subscriptions in seconds, at least the minimum;
+    /// `kRefreshNever` if there is none.
+    double getRefreshInterval() const;
+    /// Null if it is never due.
+    Foundation::Returner<Foundation::Date> getNextRefreshDate() const;
+    /// The feed's own, made on first use; null if feeders cannot be made.
+    FeedRefresher* getFeeder();
+    /// Ends what it does, and lets it go.
+    void removeFeeder();
+    bool needsRefresh();
+    /// See `FeedRefresher::refresh`.
+    bool refresh(bool force, bool queued);
+    /// The same, queued; by way of the agent where the row may not be changed here.
+    bool startRefresh();
+
+    /// Of the last refresh.
+    Foundation::NetError getLastError() const;
+    void setLastError(Foundation::NetError error);
+    /// By way of the agent where the row may not be changed here. Throws `NetException`.
+    void public_setLogin(Foundation::String* login);
+
+    // Saved documents. An operation that writes throws `AssertionFailure` where the row may not be
+    // changed; that a file cannot be written or deleted draws a warning.
+
+    /// The last document that was fetched; null for a feed in memory.
+    Foundation::URLReturner getURLOfXMLFile() const;
+    Foundation::DataReturner getXMLData() const;
+    /// Null deletes it. For a feed in memory, and while the database is restored, no file changes.
+    void setXMLData(Foundation::Data* data);
+    /// Where saved entries are, made if `create`; null for a feed in memory, and if it is not
+    /// there.
+    Foundation::URL* getURLOfEntryXMLDir(bool create) const;
+    Foundation::URLReturner getURLOfEntryXMLFile(Foundation::String* identifier);
+    /// Null data deletes it.
+    void saveEntryToFile(Foundation::String* identifier, Foundation::Data* data);
+    void deleteEntryFile(Foundation::String* identifier);
+
+    /// None: clients see a feed by its subscription.
+    OVObject* createOVObject() override;
 
     SQLite::ScalarColumn<Foundation::String> mIdentifier{this};  ///< a hash
     SQLite::ScalarColumn<Foundation::String> mID{this};          ///< the document's
@@ -97,6 +170,15 @@ class FeedCore : public CoreOf<FeedCore> {
     SQLite::ScalarColumn<Foundation::Date> mLocalDateCreatedOfNewestEntry{this};
     SQLite::ToManyColumn<EntryCore> mEntries{this, "feed"};
     SQLite::ToManyColumn<SubscriptionCore> mSubscriptions{this, "feed"};
+
+ private:
+    void refreshStarted(FeedRefresher* feeder);
+    void fetchStarted(FeedRefresher* feeder);
+    void refreshFinished(FeedRefresher* feeder);
+
+    Foundation::Ref<Foundation::Data> mXMLData;  ///< of a feed without a file
+    mutable Foundation::Ref<Foundation::URL> mEntryXMLDir;
+    Foundation::Ref<FeedRefresher> mFeeder;
 };
 
 }  // namespace Orvane

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "Foundation/NotificationNames.h"
 #include "Model/CoreOf.h"
 #include "SQLite/ScalarColumn.h"
 #include "SQLite/ToOneColumn.h"
@@ -36,6 +37,25 @@ class SubscriptionCore : public CoreOf<SubscriptionCore> {
 
     /// The columns in the order of the table.
     static const SQLite::ColumnList& columnList();
+
+    static constexpr double kDefaultRefreshInterval = 1800.0;  ///< seconds
+    static constexpr const Foundation::NotificationName& kUnreadCountChangedNotification =
+        Foundation::NotificationNames::kUnreadCountChanged;
+
+    ClientCore* getClient() const;
+    FeedCore* getFeed() const;
+    /// The feed, which may be null, must outlive the link if it is not stored.
+    void setFeed(FeedCore* feed);
+    /// Whether it has the client's defaults instead of a feed.
+    bool isClientSettings() const { return !mFeed; }
+
+    /// Seconds; infinity if it is not refreshed now. It is not while the client is not in use.
+    double getCurrentRefreshInterval() const;
+    /// How many of the feed's entries have not expired: all of them, or those that are unread.
+    /// Throws `AssertionFailure` for the client's settings, and while entries wait to be saved.
+    int getEntryCount(bool all) const;
+    /// Counts the unread entries anew. Whether that changed the count, which is then announced.
+    bool updateUnreadCount();
 
     OVObject* createOVObject() override;
 
