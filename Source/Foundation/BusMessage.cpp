@@ -119,10 +119,10 @@ BusMessage& BusMessage::setDestination(const std::string& name) {
     return *this;
 }
 
-BusMessage& BusMessage::append(std::string_view text) {
+BusMessage& BusMessage::append(const std::string& text) {
     // The bus's strings end at their first zero: half a text would be worse than none.
-    const bool fits = text.find('\0') == std::string_view::npos;
-    noteResult(fits ? sd_bus_message_append_basic(mMessage, 's', std::string(text).c_str()) : -1);
+    const bool fits = text.find('\0') == std::string::npos;
+    noteResult(fits ? sd_bus_message_append_basic(mMessage, 's', text.c_str()) : -1);
     return *this;
 }
 BusMessage& BusMessage::append(bool value) {

@@ -57,9 +57,9 @@ class BusMessage {
     BusMessage& setDestination(const std::string& name);
 
     // Appending. What cannot be appended makes the message one that is never sent.
-    BusMessage& append(std::string_view text);
-    BusMessage& append(const char* text) { return append(std::string_view(text)); }
-    BusMessage& append(const std::string& text) { return append(std::string_view(text)); }
+    BusMessage& append(std::string_view text) { return append(std::string(text)); }
+    BusMessage& append(const char* text) { return append(std::string(text)); }
+    BusMessage& append(const std::string& text);
     BusMessage& append(bool value);
     BusMessage& append(std::int32_t value);
     BusMessage& append(std::uint32_t value);

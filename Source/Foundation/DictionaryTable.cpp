@@ -18,17 +18,22 @@ const DictionaryTable::Entry* DictionaryTable::find(std::size_t hash, Matches ma
         }
         return nullptr;
     }
-    for (std::size_t slot = firstSlot(hash); mSlots[slot] != kFreeSlot;
+    for (std::size_t slot = firstSlot(hash); mSlots[slot].place != kNoPlace;
          slot = (slot + 1) & (mSlots.size() - 1)) {
-        const Entry& entry = mEntries[mSlots[slot]];
+        if (mSlots[slot].hash != static_cast<std::uint32_t>(hash)) continue;
+        const Entry& entry = mEntries[mSlots[slot].place];
         if (isIt(entry)) return &entry;
     }
     return nullptr;
 }
 
 const DictionaryTable::Entry* DictionaryTable::find(const PFRefCounted* key) const {
-    if (!key || mCount == 0) return nullptr;
-    return find(key->getHash(), [&](const PFRefCounted* other) { return IsEqual(other, key); });
+    return key && mCount > 0 ? find(key, key->getHash()) : nullptr;
+}
+
+const DictionaryTable::Entry* DictionaryTable::find(const PFRefCounted* key,
+                                                    std::size_t hash) const {
+    return find(hash, [&](const PFRefCounted* other) { return IsEqual(other, key); });
 }
 
 const DictionaryTable::Entry* DictionaryTable::find(std::string_view key) const {
@@ -40,14 +45,15 @@ const DictionaryTable::Entry* DictionaryTable::find(std::string_view key) const 
 }
 
 void DictionaryTable::set(const PFRefCounted* key, ObjectRef value) {
-    if (const Entry* found = find(key)) {
+    const std::size_t hash = key->getHash();
+    if (const Entry* found = find(key, hash)) {
         // The old value goes when the table is in order again: its end may look here.
         value = std::exchange(mEntries[static_cast<std::size_t>(found - mEntries.data())].value,
                               std::move(value));
         return;
     }
     if (mEntries.size() >= capacity()) makeRoom();
-    mEntries.push_back({key->getHash(), key, std::move(value)});
+    mEntries.push_back({hash, key, std::move(value)});
     ++mCount;
     if (!mSlots.empty()) index(static_cast<std::uint32_t>(mEntries.size() - 1));
 }
@@ -82,18 +88,19 @@ void DictionaryTable::makeRoom() {
     std::erase_if(mEntries, [](const Entry& entry) { return entry.key.isNull(); });
     mSlots.clear();
     if (mCount < kCapacityWithoutIndex) return;
-    mSlots.assign(std::bit_ceil(2 * (mCount + 1)), kFreeSlot);
+    mSlots.assign(std::bit_ceil(2 * (mCount + 1)), Slot());
     for (std::size_t i = 0; i < mEntries.size(); ++i) {
         index(static_cast<std::uint32_t>(i));
     }
 }
 
 void DictionaryTable::index(std::uint32_t place) {
-    std::size_t slot = firstSlot(mEntries[place].hash);
-    while (mSlots[slot] != kFreeSlot) {
+    const std::size_t hash = mEntries[place].hash;
+    std::size_t slot = firstSlot(hash);
+    while (mSlots[slot].place != kNoPlace) {
         slot = (slot + 1) & (mSlots.size() - 1);
     }
-    mSlots[slot] = place;
+    mSlots[slot] = {place, static_cast<std::uint32_t>(hash)};
 }
 
 }  // namespace Foundation

@@ -38,17 +38,24 @@ class DictionaryTable {
 
  private:
     static constexpr std::size_t kCapacityWithoutIndex = 8;
-    static constexpr std::uint32_t kFreeSlot = UINT32_MAX;
+    static constexpr std::uint32_t kNoPlace = UINT32_MAX;
+
+    /// A place in the list, with so much of its key's hash that few others need be looked at.
+    struct Slot {
+        std::uint32_t place = kNoPlace;
+        std::uint32_t hash = 0;
+    };
 
     template <class Matches>
     const Entry* find(std::size_t hash, Matches matches) const;
+    const Entry* find(const PFRefCounted* key, std::size_t hash) const;
     std::size_t firstSlot(std::size_t hash) const;
     std::size_t capacity() const;
     void makeRoom();
     void index(std::uint32_t place);
 
     std::vector<Entry> mEntries;
-    std::vector<std::uint32_t> mSlots;  ///< places in mEntries; a power of two, or none
+    std::vector<Slot> mSlots;  ///< a power of two, or none
     std::size_t mCount = 0;
 };
 

@@ -1,9 +1,11 @@
 #include "Foundation/Number.h"
 
 #include "Foundation/AssertionFailure.h"
+#include "Foundation/Ref.h"
 #include "Foundation/String.h"
 
 #include <fmt/format.h>
+#include <array>
 #include <cmath>
 #include <functional>
 #include <limits>
@@ -17,9 +19,22 @@ constexpr double kEndOfIntegers = 9223372036854775808.0;
 
 }  // namespace
 
+Returner<Number> Number::integerNumber(std::int64_t value) {
+    // Codes and counts, which come again and again, are made once. Never destroyed, as what ends
+    // with the process may still use them.
+    constexpr std::size_t kKept = 32;
+    static auto& sKept = *new std::array<Ref<Number>, kKept>;
+    if (value < 0 || value >= std::int64_t{kKept}) {
+        return Returner<Number>(new Number(Kind::Integer, value));
+    }
+    Ref<Number>& number = sKept[static_cast<std::size_t>(value)];
+    if (!number) number = Returner<Number>(new Number(Kind::Integer, value));
+    return Returner<Number>(number);
+}
+
 Returner<Number> Number::unsignedNumber(std::uint64_t value) {
     OV_ASSERT_MESSAGE(value <= INT64_MAX, "%llu does not fit a number", value);
-    return Returner<Number>(new Number(Kind::Integer, static_cast<std::int64_t>(value)));
+    return integerNumber(static_cast<std::int64_t>(value));
 }
 
 bool Number::getBool() const {

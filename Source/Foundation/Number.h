@@ -10,16 +10,14 @@
 namespace Foundation {
 
 /// A truth value, an integer or a real number. Immutable; knows which of them it was made from.
-class Number : public PFRefCounted {
+class Number final : public PFRefCounted {
  public:
     enum class Kind { Bool, Integer, Real };
 
     static Returner<Number> number(std::same_as<bool> auto value) {
         return Returner<Number>(new Number(Kind::Bool, value ? 1 : 0));
     }
-    static Returner<Number> number(std::signed_integral auto value) {
-        return Returner<Number>(new Number(Kind::Integer, value));
-    }
+    static Returner<Number> number(std::signed_integral auto value) { return integerNumber(value); }
     /// Throws `AssertionFailure` for a value that 64 bits with a sign cannot hold.
     static Returner<Number> number(std::unsigned_integral auto value) requires(
         !std::same_as<decltype(value), bool>) {
@@ -52,6 +50,7 @@ class Number : public PFRefCounted {
  private:
     Number(Kind kind, std::int64_t value) : mKind(kind), mInteger(value) {}
     explicit Number(double value) : mKind(Kind::Real), mReal(value) {}
+    static Returner<Number> integerNumber(std::int64_t value);
     static Returner<Number> unsignedNumber(std::uint64_t value);
     bool isInteger() const;
 

@@ -10,6 +10,7 @@
 #include <unicode/timezone.h>
 
 #include <algorithm>
+#include <array>
 #include <functional>
 #include <iterator>
 #include <map>
@@ -85,8 +86,9 @@ TimeZoneReturner TimeZone::fixedZone(std::int32_t secondsFromGMT) {
     if (secondsFromGMT % kStep != 0 || steps < -kMostSteps || steps > kMostSteps) {
         return TimeZoneReturner(new TimeZone(secondsFromGMT));
     }
-    static Ref<TimeZone> sZones[2 * kMostSteps + 1];
-    Ref<TimeZone>& zone = sZones[steps + kMostSteps];
+    // Never destroyed, as what ends with the process may still use them.
+    static auto& sZones = *new std::array<Ref<TimeZone>, 2 * kMostSteps + 1>;
+    Ref<TimeZone>& zone = sZones[static_cast<std::size_t>(steps + kMostSteps)];
     if (!zone) zone = TimeZoneReturner(new TimeZone(secondsFromGMT));
     return TimeZoneReturner(zone);
 }

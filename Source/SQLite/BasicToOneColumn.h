@@ -22,6 +22,11 @@ class BasicToOneColumn : public ScalarColumn<long long> {
     void saveChanges(Table* destination);
     /// The owner is saved.
     void clearChanged();
+    /// As any column; what it points at in memory is a change too.
+    void unload() {
+        if (mUnsavedRow) dropUnsavedRow();
+        Column::unload();
+    }
 
     void bindTo(Query& query, int index) const;
 

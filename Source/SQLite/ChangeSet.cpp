@@ -4,7 +4,6 @@
 
 #include <algorithm>
 #include <utility>
-#include <vector>
 
 namespace SQLite {
 
@@ -17,22 +16,6 @@ using Foundation::Returner;
 using Foundation::String;
 
 namespace {
-
-using MutableTableChanges = MutableDictionaryOf<String, Number>;
-
-Returner<MutableTableChanges> describeTable(const std::unordered_map<RowID, int>& rows) {
-    std::vector<std::pair<RowID, int>> ordered(rows.begin(), rows.end());
-    std::sort(ordered.begin(), ordered.end());
-    Ref<MutableTableChanges> made{MutableTableChanges::dictionary()};
-    // Three values stand for all rows.
-    std::map<int, Ref<Number>> numbers;
-    for (const auto& [rowID, action] : ordered) {
-        Ref<Number>& number = numbers[action];
-        if (!number.get()) number = Number::number(action);
-        made->set(std::to_string(rowID), number.get());
-    }
-    return Returner<MutableTableChanges>(std::move(made));
-}
 
 const char* signOf(std::int64_t action) {
     switch (action) {
@@ -52,16 +35,46 @@ const char* signOf(std::int64_t action) {
 void ChangeSet::note(int action, const char* table, RowID rowID) {
     auto found = mTables.find(std::string_view(table));
     if (found == mTables.end()) found = mTables.try_emplace(table).first;
-    found->second[rowID] = action;
+    auto& [list, tidyAt] = found->second;
+    if (!list.empty() && list.back().rowID == rowID) {
+        list.back().action = action;
+        return;
+    }
+    if (list.size() >= tidyAt) {
+        tidy(list);
+        tidyAt = std::max(tidyAt, 2 * list.size());
+    }
+    list.push_back({rowID, action});
+}
+
+void ChangeSet::tidy(std::vector<Change>& list) {
+    const auto isBefore = [](const Change& a, const Change& b) { return a.rowID < b.rowID; };
+    if (!std::is_sorted(list.begin(), list.end(), isBefore)) {
+        std::stable_sort(list.begin(), list.end(), isBefore);
+    }
+    // Backwards, as the last of the changes of a row is the one that counts.
+    const auto isSame = [](const Change& a, const Change& b) { return a.rowID == b.rowID; };
+    const auto first = std::unique(list.rbegin(), list.rend(), isSame).base();
+    list.erase(list.begin(), first);
+}
+
+Returner<TableChangeDict> ChangeSet::describe(std::vector<Change> list) {
+    using MutableChanges = MutableDictionaryOf<String, Number>;
+    tidy(list);
+    Ref<MutableChanges> made{MutableChanges::dictionary()};
+    for (const auto& [rowID, action] : list) {
+        made->set(std::to_string(rowID), Number::number(action));
+    }
+    return Returner<MutableChanges>(std::move(made));
 }
 
 Returner<ChangeDict> ChangeSet::dictionary() const {
-    using Changes = MutableDictionaryOf<String, TableChangeDict>;
-    Ref<Changes> made{Changes::dictionary()};
-    for (const auto& [table, rows] : mTables) {
-        made->set(table, describeTable(rows));
+    using Tables = MutableDictionaryOf<String, TableChangeDict>;
+    Ref<Tables> made{Tables::dictionary()};
+    for (const auto& [table, changes] : mTables) {
+        made->set(table, describe(changes.list));
     }
-    return Returner<Changes>(std::move(made));
+    return Returner<Tables>(std::move(made));
 }
 
 Foundation::StringReturner describeChanges(const Dictionary* changes) {

@@ -6,7 +6,7 @@
 
 #include <map>
 #include <string>
-#include <unordered_map>
+#include <vector>
 
 namespace SQLite {
 
@@ -30,7 +30,22 @@ class ChangeSet {
     Foundation::Returner<ChangeDict> dictionary() const;
 
  private:
-    std::map<std::string, std::unordered_map<RowID, int>, std::less<>> mTables;
+    struct Change {
+        RowID rowID;
+        int action;
+    };
+    /// What happened to a table's rows, in order. A row that comes again and again is only kept so
+    /// often that the list stays in proportion to the rows.
+    struct Changes {
+        std::vector<Change> list;
+        std::size_t tidyAt = 1024;  ///< the length at which the list is next made short
+    };
+
+    /// Leaves the last change of each row, by ID.
+    static void tidy(std::vector<Change>& list);
+    static Foundation::Returner<TableChangeDict> describe(std::vector<Change> list);
+
+    std::map<std::string, Changes, std::less<>> mTables;
 };
 
 /// A change set for the log: for each table a line with its name, and the row IDs with "+" for an

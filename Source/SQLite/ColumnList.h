@@ -28,6 +28,8 @@ struct ColumnKind {
 struct ColumnSpec {
     const char* name;  ///< null for a to-many column, which is none of the table's own
     Column& (*in)(Row& row);
+    /// Forgets the value and its changes.
+    void (*unload)(Row& row);
     /// Takes over what a cursor has in a result column; not for a to-many column.
     void (*load)(Row& row, const Cursor& cursor, int index);
     const ColumnKind* kind;
@@ -47,6 +49,7 @@ ColumnSpec column(const char* name) {
     using Class = typename ColumnMember<decltype(Member)>::Class;
     using Type = typename ColumnMember<decltype(Member)>::ColumnType;
     return {name, [](Row& row) -> Column& { return static_cast<Class&>(row).*Member; },
+            [](Row& row) { (static_cast<Class&>(row).*Member).unload(); },
             [](Row& row, const Cursor& cursor, int index) {
                 if constexpr (requires(Type & type) { type.loadValue(cursor, index); }) {
                     (static_cast<Class&>(row).*Member).loadValue(cursor, index);

@@ -14,10 +14,7 @@ using Foundation::Ref;
 
 void ListedRow::unload() {
     for (const ColumnSpec& spec : columns()) {
-        Column& column = spec.in(*this);
-        // What it pointed at in memory is a change too.
-        if (spec.kind->clear) spec.kind->clear(column);
-        column.unload();
+        spec.unload(*this);
     }
     Row::unload();
 }

@@ -15,6 +15,7 @@
 
 #include <algorithm>
 #include <utility>
+#include <vector>
 
 namespace SQLite {
 
@@ -96,13 +97,10 @@ Query& Table::_insertQuery(const ColumnList& columns) {
 Returner<Row> Table::_rowWithID(RowID rowID) {
     OV_ASSERT_AS(rowID > 0, "rowID>0");
     mDatabase->_checkThread();
-    const auto found = mRows.lower_bound(rowID);
-    if (found != mRows.end() && found->first == rowID) {
-        return Returner<Row>::retained(found->second);
-    }
+    if (Row* const known = _cachedRowWithID(rowID)) return Returner<Row>::retained(known);
     Ref<Row> row = _allocRowWithID(rowID);
     if (mCacheAllRows) {
-        mRows.emplace_hint(found, rowID, row.get());
+        mRows.emplace(rowID, row.get());
         row->setCached(true, mRetainRows);
         gLogPersist.log("Table %s: mCacheAllRows is set.  Caching row #%lli [%p]", mName, rowID,
                         row.get());
@@ -158,19 +156,19 @@ void Table::saveNewRows() {
 }
 
 void Table::saveChangedRows() {
-    // Goes on by ID, as a save alters the map.
-    for (auto entry = mRows.begin(); entry != mRows.end();) {
-        if (!entry->second->mChanged) {
-            ++entry;
-            continue;
-        }
-        const RowID rowID = entry->first;
-        {
-            const AutoreleasePool pool;
-            const Ref<Row> row = entry->second;
-            row->saveChanges();
-        }
-        entry = mRows.upper_bound(rowID);
+    // By ID, and looked up one by one, as a save alters the map.
+    std::vector<RowID> rowIDs;
+    rowIDs.reserve(mRows.size());
+    for (const auto& entry : mRows) {
+        rowIDs.push_back(entry.first);
+    }
+    std::sort(rowIDs.begin(), rowIDs.end());
+    for (const RowID rowID : rowIDs) {
+        Row* const row = _cachedRowWithID(rowID);
+        if (!row || !row->mChanged) continue;
+        const AutoreleasePool pool;
+        const Ref<Row> held = row;
+        held->saveChanges();
     }
 }
 

@@ -7,8 +7,8 @@
 #include "SQLite/Types.h"
 
 #include <list>
-#include <map>
 #include <memory>
+#include <unordered_map>
 
 namespace Foundation {
 class Dictionary;
@@ -115,7 +115,7 @@ class Table : Foundation::Uncopyable {
     void _rolledBack();
 
  private:
-    using Rows = std::map<RowID, Row*>;
+    using Rows = std::unordered_map<RowID, Row*>;
 
     void _cacheRow(Row* row, bool retained);
     void _cacheNewRow(Row* row);

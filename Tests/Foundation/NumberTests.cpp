@@ -89,3 +89,14 @@ TEST(Number, NullCountsAsZero) {
     EXPECT_EQ(Number::getReal(nullptr), 0.0);
     EXPECT_EQ(Number::getInteger(make(7).get()), 7);
 }
+
+TEST(Number, IsMadeOnceForACommonInteger) {
+    const Ref<Number> first = Number::number(23);
+    EXPECT_EQ(first.get(), Ref<Number>(Number::number(23)).get());
+    EXPECT_EQ(first->getInteger(), 23);
+    for (const long long other : {-1LL, 32LL, 1LL << 40}) {
+        const Ref<Number> number = Number::number(other);
+        EXPECT_EQ(number->getInteger(), other);
+        EXPECT_NE(number.get(), Ref<Number>(Number::number(other)).get());
+    }
+}
