@@ -88,7 +88,8 @@ TimeZoneReturner TimeZone::fixedZone(std::int32_t secondsFromGMT) {
     }
     // Never destroyed, as what ends with the process may still use them.
     static auto& sZones = *new std::array<Ref<TimeZone>, 2 * kMostSteps + 1>;
-    Ref<TimeZone>& zone = sZones[static_cast<std::size_t>(steps + kMostSteps)];
+    const std::int32_t place = steps + kMostSteps;
+    Ref<TimeZone>& zone = sZones[static_cast<std::size_t>(place)];
     if (!zone) zone = TimeZoneReturner(new TimeZone(secondsFromGMT));
     return TimeZoneReturner(zone);
 }

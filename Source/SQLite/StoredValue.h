@@ -41,16 +41,19 @@ class StoredValue {
             mRaw = cursor.doubleColumn(column);
             mIsRaw = true;
         } else {
-            const std::string_view bytes = isText() ? cursor.textColumn(column)  //
-                                                    : cursor.blobColumn(column);
+            const std::string_view bytes = bytesIn(cursor, column);
             mIsRaw = bytes.data() != nullptr;
             if (mIsRaw) mRaw.assign(bytes);
         }
     }
 
  private:
-    static constexpr bool isText() {
-        return std::is_same_v<T, Foundation::String> || std::is_same_v<T, Foundation::URL>;
+    static std::string_view bytesIn(const Cursor& cursor, int column) {
+        if constexpr (std::is_same_v<T, Foundation::String> || std::is_same_v<T, Foundation::URL>) {
+            return cursor.textColumn(column);
+        } else {
+            return cursor.blobColumn(column);
+        }
     }
     static Foundation::Returner<T> make(Raw raw) {
         if constexpr (kIsDate) {
