@@ -1,6 +1,8 @@
 #include "Model/AuthorCore.h"
 
+#include "Foundation/Logger.h"
 #include "Foundation/URL.h"
+#include "Model/AgentLink.h"
 #include "Model/PublicObjects.h"
 #include "SQLite/Database.h"
 #include "SQLite/QueryOf.h"
@@ -8,6 +10,7 @@
 namespace Orvane {
 
 using Foundation::IsEqual;
+using Foundation::Ref;
 using Foundation::Returner;
 using Foundation::String;
 using SQLite::column;
@@ -49,8 +52,8 @@ bool AuthorCore::isEmpty() const {
 
 Returner<AuthorCore> AuthorCore::findInDatabase() {
     if (getTable()) return Returner<AuthorCore>::retained(this);
+    if (!SQLite::gDatabase || !SQLite::gDatabase->isOpen()) return nullptr;
     SQLite::TableOf<AuthorCore>* table = SQLite::TableOf<AuthorCore>::instance();
-    if (!table->getDatabase()->isOpen()) return nullptr;
     static auto* const sQuery = new SQLite::QueryOf<AuthorCore>(
         table,
         "select rowID from Authors  where ifnull(name,'')=? and ifnull(email,'')=?"
@@ -63,6 +66,29 @@ Returner<AuthorCore> AuthorCore::findInDatabase() {
         sQuery->bind(3, "", false);
     }
     return sQuery->firstRow();
+}
+
+Returner<AuthorCore> AuthorCore::addToDatabase() {
+    Ref<AuthorCore> known = findInDatabase();
+    if (known.get()) return known;
+    if (SQLite::gDatabase->isWriteable()) {
+        saveChanges();
+        return Returner<AuthorCore>::retained(this);
+    }
+    gLogAPI.log("Asking agent to add %@ to db ...", this);
+    known = AgentLink::current().createAuthor(mName, mEmail, mURL, mContactBookUID);
+    gLogAPI.log("AuthorCore: ...created %@", known);
+    return known;
+}
+
+bool AuthorCore::public_setContactBookUID(String* uid) {
+    if (isChangeable()) {
+        mContactBookUID.setValue(uid);
+    } else {
+        AgentLink::current().setContactBookUID(this, uid);
+        mContactBookUID.unload();
+    }
+    return true;
 }
 
 bool IsContentEqual(const AuthorCore* a, const AuthorCore* b) {

@@ -33,6 +33,13 @@ class AuthorCore : public CoreOf<AuthorCore> {
     /// closed.
     Foundation::Returner<AuthorCore> findInDatabase();
 
+    /// The same, but where there is none this author becomes it or, in a process that only reads,
+    /// the agent makes it. Null if the agent could not.
+    Foundation::Returner<AuthorCore> addToDatabase();
+    /// Sets the contact, by way of the agent where the row may not be changed here. True but for a
+    /// failed call, which throws.
+    bool public_setContactBookUID(Foundation::String* uid);
+
     SQLite::ScalarColumn<Foundation::String> mName{this};
     SQLite::ScalarColumn<Foundation::String> mEmail{this};
     SQLite::ScalarColumn<Foundation::URL> mURL{this};

@@ -1,7 +1,12 @@
 #include "Model/ContentCore.h"
 
+#include "FeedParser/Text/HTMLSnippetTidier.h"
+#include "FeedParser/Text/ParserUtils.h"
+#include "FeedParser/Text/XMLSnippetTidier.h"
 #include "Foundation/MIMEType.h"
 #include "Model/PublicObjects.h"
+
+#include <string>
 
 namespace Orvane {
 
@@ -11,10 +16,26 @@ using Foundation::Returner;
 using Foundation::String;
 using SQLite::column;
 
+using FeedParser::HTMLSnippetTidier;
+using FeedParser::Tidier;
+using FeedParser::XMLSnippetTidier;
+
 namespace {
+
+constexpr int kUTF8 = 1;  ///< as libxml2 counts encodings
 
 Ref<Foundation::MIMEType> typeOf(const ContentCore& content) {
     return Foundation::MIMEType::type(content.mMIMEType);
+}
+
+/// The text of HTML, up to its first zero byte; null if it is no UTF-8.
+Foundation::StringReturner withoutMarkup(const Foundation::Data& html) {
+    std::string buffer(html.view());
+    ParserUtils::decodeEntities(buffer.data(), buffer.data(), false);
+    ParserUtils::convertToPlainText(buffer.data(), buffer.data());
+    char* text = buffer.data();
+    ParserUtils::trim(&text);
+    return String::string(text);
 }
 
 }  // namespace
@@ -35,7 +56,25 @@ OVObject* ContentCore::createOVObject() {
 }
 
 Foundation::Data* ContentCore::getData() const {
+    // Tidying changes the form of the data, not what it says.
+    if (mNeedsTidy) const_cast<ContentCore*>(this)->tidyNow();
     return mData;
+}
+
+void ContentCore::tidyNow() {
+    static const Ref<Tidier> sHTMLTidier = Returner<Tidier>::adopted(new HTMLSnippetTidier);
+    static const Ref<Tidier> sXMLTidier = Returner<Tidier>::adopted(new XMLSnippetTidier);
+    mNeedsTidy = false;
+    const Ref<Foundation::URL> base = mTidyBaseURL;
+    mTidyBaseURL = nullptr;
+    const Ref<Foundation::Data> data = mData.getValue();
+    if (!data.get()) return;
+    const bool isXML = isXMLString();
+    const Ref<Tidier>& first = isXML ? sXMLTidier : sHTMLTidier;
+    const Ref<Tidier>& second = isXML ? sHTMLTidier : sXMLTidier;
+    Ref<Foundation::Data> tidied = first->tidy(data.get(), kUTF8, base.get());
+    if (!tidied.get()) tidied = second->tidy(data.get(), kUTF8, base.get());
+    mData.setValue(tidied.get());
 }
 
 Foundation::StringReturner ContentCore::getComputedHash() const {
@@ -94,6 +133,36 @@ String* ContentCore::getRawString() const {
     return String::string(data->asBytes(), Foundation::StringEncoding::kUTF8);
 }
 
+String* ContentCore::getPlainTextString() const {
+    if (mPlainText.get()) return mPlainText;
+    if (isPlainTextString()) {
+        mPlainText = getRawString();
+    } else if (isHTMLString()) {
+        const Foundation::Data* data = getData();
+        if (data) mPlainText = withoutMarkup(*data);
+    }
+    return mPlainText;
+}
+
+String* ContentCore::getHTMLString() const {
+    if (mHTML.get()) return mHTML;
+    if (isHTMLString()) {
+        mHTML = getRawString();
+    } else if (isPlainTextString()) {
+        mHTML = ParserUtils::convertToHTML(getData());
+    }
+    return mHTML;
+}
+
+String* ContentCore::getAtomString(bool asHTML) const {
+    const Foundation::Data* data = getData();
+    if (!data) return nullptr;
+    const bool isXML = isXMLString();
+    if (!isXML && !isTextString()) return data->base64String();
+    if (asHTML && !isXML) return ParserUtils::convertToHTML(data);
+    return getRawString();
+}
+
 String* ContentCore::getAtomType() const {
     const Ref<Foundation::MIMEType> type = typeOf(*this);
     if (isPlainTextString()) return String::string("text");
@@ -107,6 +176,11 @@ void ContentCore::unload() {
     mTidyBaseURL = nullptr;
     forgetTexts();
     CoreOf::unload();
+}
+
+void ContentCore::saveChanges() {
+    if (mNeedsTidy) tidyNow();
+    CoreOf::saveChanges();
 }
 
 void ContentCore::_forgetLoaded() {

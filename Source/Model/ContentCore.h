@@ -53,19 +53,29 @@ class ContentCore : public CoreOf<ContentCore> {
 
     // Texts of the data. Valid until the current pool drains. Null for data that is not UTF-8.
 
+    /// The text without markup; null for what is neither plain text nor HTML.
+    Foundation::String* getPlainTextString() const;
     /// The data as it stands.
     Foundation::String* getRawString() const;
+    /// The text as HTML; null for what is neither plain text nor HTML.
+    Foundation::String* getHTMLString() const;
+    /// What stands in an Atom text construct of type `getAtomType`: the text itself or, with
+    /// `asHTML` and unless it is XML, escaped for HTML; base64 for other data.
+    Foundation::String* getAtomString(bool asHTML) const;
     /// "text", "xhtml", "html", or the type itself.
     Foundation::String* getAtomType() const;
 
     /// What was made of the data goes with it.
     void unload() override;
     void _forgetLoaded() override;
+    /// The file does not say that data waits to be tidied, so that is done first.
+    void saveChanges() override;
 
     SQLite::ScalarColumn<Foundation::Data> mData{this};  ///< UTF-8 of a text, or raw
     SQLite::ScalarColumn<Foundation::String> mMIMEType{this};
 
  private:
+    void tidyNow();
     void forgetTexts();
 
     mutable Foundation::Ref<Foundation::String> mPlainText;  ///< null until asked for

@@ -1,6 +1,7 @@
 #include "Foundation/AssertionFailure.h"
 #include "Foundation/Logger.h"
 #include "Foundation/URL.h"
+#include "Model/AgentLink.h"
 #include "Model/ContentCore.h"
 #include "Model/EntryCore.h"
 #include "Model/FeedCore.h"
@@ -75,15 +76,15 @@ ContentCore* EntryCore::getXMLRepresentation() const {
 }
 
 void EntryCore::setContent(ContentCore* content) {
-    _setContentColumn(mContent, content);
+    _setContentColumn(mContent, "content", content);
 }
 
 void EntryCore::setSummary(ContentCore* summary) {
-    _setContentColumn(mSummary, summary);
+    _setContentColumn(mSummary, "summary", summary);
 }
 
 void EntryCore::setXMLRepresentation(ContentCore* source) {
-    _setContentColumn(mXMLRepresentation, source);
+    _setContentColumn(mXMLRepresentation, "XMLRepresentation", source);
 }
 
 EntryCore::ContentColumn& EntryCore::contentColumn(std::string_view name) {
@@ -102,15 +103,18 @@ void EntryCore::setContentColumn(const char* name, String* mimeType, Data* data)
         content->mMIMEType.setValue(mimeType);
         content->mData.setValue(data);
     }
-    _setContentColumn(column, content.get());
+    _setContentColumn(column, name, content.get());
 }
 
-void EntryCore::_setContentColumn(ContentColumn& column, ContentCore* content) {
+void EntryCore::_setContentColumn(ContentColumn& column, const char* name, ContentCore* content) {
     const Ref<ContentCore> present = column.getValue();
     // What nobody has read yet is replaced without a look, which would tidy both.
     const bool isUnread = present.get() && content && present->needsTidy();
     if (!isUnread && IsContentEqual(present.get(), content)) return;
-    if (content) {
+    if (!isChangeable()) {
+        AgentLink::current().setContent(this, name, content);
+        column.unload();
+    } else if (content) {
         replaceContent(column, present.get(), content);
     } else {
         present->deleteRow();

@@ -1,13 +1,18 @@
 #include "Model/EntryCore.h"
 
 #include "Foundation/AssertionFailure.h"
+#include "Foundation/Guard.h"
 #include "Foundation/Logger.h"
 #include "Foundation/NetException.h"
+#include "Model/AgentLink.h"
 #include "Model/AuthorCore.h"
 #include "Model/ContentCore.h"
 #include "Model/EnclosureCore.h"
 #include "Model/FeedCore.h"
 #include "Model/PublicObjects.h"
+#include "Model/SyncPlanner.h"
+#include "SQLite/Database.h"
+#include "SQLite/Transaction.h"
 
 namespace Orvane {
 
@@ -15,76 +20,6 @@ using Foundation::Date;
 using Foundation::Ref;
 using Foundation::Returner;
 using Foundation::String;
-using SQLite::column;
-
-const char EntryCore::kSchema[] =
-    "rowID integer not null unique primary key, identifier text unique, id text, title text, "
-    "rights text, content integer references Contents(rowID), contentHash text, "
-    "summary integer references Contents(rowID), summaryHash text, "
-    "xmlRepresentation integer references Contents(rowID), xmlRepresentationHash text, "
-    "dateUpdated real, timeZoneUpdated blob, datePublished real, timeZonePublished blob, "
-    "dateCreated real, timeZoneCreated blob, baseUrl text, alternateUrl text, "
-    "author integer references Authors(rowID), feed integer references Feeds(rowID), "
-    "current integer, tombstone integer, read integer, flagged integer, localDateCreated real, "
-    "localDateUpdated real, localDateXmlChanged real, localDateFlagsUpdated real";
-
-const SQLite::Table::IndexSpec EntryCore::kSchemaIndexes[] = {
-    {"Entries_identifier", "identifier"},
-    {"Entries_unreadcount", "feed, read, localDateCreated"},
-    {"Entries_tosync", "localDateFlagsUpdated"},
-    {nullptr, nullptr},
-};
-
-namespace {
-
-constexpr const char* kNoteNewestEntry =
-    "BEGIN UPDATE Feeds SET localDateCreatedOfNewestEntry = MAX(localDateCreatedOfNewestEntry, "
-    "NEW.localDateCreated) WHERE rowID = NEW.feed; END";
-
-}  // namespace
-
-const SQLite::Table::TriggerSpec EntryCore::kSchemaTriggers[] = {
-    {"Entries_update_feeds_localdatecreatedofnewestentryinfeed_after_update",
-     "AFTER UPDATE OF localDateCreated", kNoteNewestEntry},
-    {"Entries_update_feeds_localdatecreatedofnewestentryinfeed_after_insert", "AFTER INSERT",
-     kNoteNewestEntry},
-    {nullptr, nullptr, nullptr},
-};
-
-const SQLite::ColumnList& EntryCore::columnList() {
-    static const SQLite::ColumnList sColumns = {
-        column<&EntryCore::mIdentifier>("identifier"),
-        column<&EntryCore::mID>("id"),
-        column<&EntryCore::mTitle>("title"),
-        column<&EntryCore::mRights>("rights"),
-        column<&EntryCore::mContent>("content"),
-        column<&EntryCore::mContentHash>("contentHash"),
-        column<&EntryCore::mSummary>("summary"),
-        column<&EntryCore::mSummaryHash>("summaryHash"),
-        column<&EntryCore::mXMLRepresentation>("xmlRepresentation"),
-        column<&EntryCore::mXMLRepresentationHash>("xmlRepresentationHash"),
-        column<&EntryCore::mDateUpdated>("dateUpdated"),
-        column<&EntryCore::mTimeZoneUpdated>("timeZoneUpdated"),
-        column<&EntryCore::mDatePublished>("datePublished"),
-        column<&EntryCore::mTimeZonePublished>("timeZonePublished"),
-        column<&EntryCore::mDateCreated>("dateCreated"),
-        column<&EntryCore::mTimeZoneCreated>("timeZoneCreated"),
-        column<&EntryCore::mBaseURL>("baseUrl"),
-        column<&EntryCore::mAlternateURL>("alternateUrl"),
-        column<&EntryCore::mAuthor>("author"),
-        column<&EntryCore::mFeed>("feed"),
-        column<&EntryCore::mCurrent>("current"),
-        column<&EntryCore::mTombstone>("tombstone"),
-        column<&EntryCore::mRead>("read"),
-        column<&EntryCore::mFlagged>("flagged"),
-        column<&EntryCore::mLocalDateCreated>("localDateCreated"),
-        column<&EntryCore::mLocalDateUpdated>("localDateUpdated"),
-        column<&EntryCore::mLocalDateXMLChanged>("localDateXmlChanged"),
-        column<&EntryCore::mLocalDateFlagsUpdated>("localDateFlagsUpdated"),
-        SQLite::toMany<&EntryCore::mEnclosures>(),
-    };
-    return sColumns;
-}
 
 OVObject* EntryCore::createOVObject() {
     return PublicObjects::makeFor(this);
@@ -119,6 +54,94 @@ Date* EntryCore::getDateForDisplay() const {
 
 std::uint64_t EntryCore::getSortValue() const {
     return getRowID() != 0 ? static_cast<std::uint64_t>(getRowID()) : mSortValue;
+}
+
+void EntryCore::setRead(bool read) {
+    if (mRead == read) return;
+    mRead.setValue(read);
+    mLocalDateFlagsUpdated.setValue(Date::now());
+    if (FeedCore* feed = getFeed()) feed->updateUnreadCounts();
+}
+
+void EntryCore::setFlagged(bool flagged) {
+    if (mFlagged == flagged) return;
+    mFlagged.setValue(flagged);
+    mLocalDateFlagsUpdated.setValue(Date::now());
+}
+
+bool EntryCore::changeFlags(bool read, bool flagged, bool updateCounts) {
+    const bool isReadNew = mRead != read;
+    const bool isFlaggedNew = mFlagged != flagged;
+    if (!isReadNew && !isFlaggedNew) return false;
+    mLocalDateFlagsUpdated.setValue(Date::now());
+    if (isFlaggedNew) mFlagged.setValue(flagged);
+    if (!isReadNew) return true;
+    mRead.setValue(read);
+    FeedCore* feed = updateCounts ? getFeed() : nullptr;
+    if (feed) feed->updateUnreadCounts();
+    return true;
+}
+
+bool EntryCore::public_setRead(bool read) {
+    if (isChangeable()) {
+        setRead(read);
+    } else {
+        AgentLink::current().setRead(this, read);
+        mRead.unload();
+    }
+    return true;
+}
+
+bool EntryCore::public_setFlagged(bool flagged) {
+    if (isChangeable()) {
+        setFlagged(flagged);
+    } else {
+        AgentLink::current().setFlagged(this, flagged);
+        mFlagged.unload();
+    }
+    return true;
+}
+
+void EntryCore::ipcWillChangeColumn(int column) {
+    if (column == ColumnID::Read || column == ColumnID::Flagged) return;
+    throw Foundation::NetException(Foundation::NetError::kOrvane, OVReadOnlyError);
+}
+
+void EntryCore::ipcDidChangeColumn(int column) {
+    OV_ASSERT_AS(column == ColumnID::Read || column == ColumnID::Flagged,
+                 "col == ColumnID::Read || col == ColumnID::Flagged");
+    if (SyncPlanner* planner = SyncPlanner::current()) planner->autoSyncSoon();
+}
+
+void EntryCore::deleteRow() {
+    Foundation::gLog.log("Deleting %@", this);
+    if (getRowID() == 0) return CoreOf::deleteRow();
+    requireChangeable();
+    const SQLite::Transaction transaction(true);
+    deleteChildren();
+    FeedCore* feed = getFeed();
+    if (feed && !mCurrent) feed->deleteEntryFile(getIdentifier());
+    CoreOf::deleteRow();
+}
+
+void EntryCore::deleteChildren() {
+    constexpr const char* kWhere = "virtual void Orvane::EntryCore::deleteRow()";
+    SQLite::Database* database = getTable()->getDatabase();
+    // What is left behind takes room and does no harm.
+    Foundation::callGuarded(kWhere, [&] {
+        static auto* const sQuery =
+            new SQLite::Query(database, "delete from Contents where rowID in (?,?,?)");
+        sQuery->bindRowID(1, mContent.getRowID());
+        sQuery->bindRowID(2, mSummary.getRowID());
+        sQuery->bindRowID(3, mXMLRepresentation.getRowID());
+        sQuery->execute();
+    });
+    Foundation::callGuarded(kWhere, [&] {
+        static auto* const sQuery =
+            new SQLite::Query(database, "delete from Enclosures where entry=?");
+        sQuery->bindRowID(1, getRowID());
+        sQuery->execute();
+    });
 }
 
 void EntryCore::saveChanges() {

@@ -1,65 +1,22 @@
 #pragma once
 
-#include "Model/CoreOf.h"
+#include "Foundation/ArrayOf.h"
+#include "Model/EntryColumns.h"
 #include "SQLite/RowIterator.h"
-#include "SQLite/ScalarColumn.h"
-#include "SQLite/ToManyColumn.h"
-#include "SQLite/ToOneColumn.h"
 
 #include <cstdint>
 #include <string_view>
 
 namespace Orvane {
 
-class AuthorCore;
-class ContentCore;
-class EnclosureCore;
-class FeedCore;
+class XMLElement;
+
+class XMLElement;
 
 /// A post of a feed: a row of "Entries". Free until it is merged into the store.
-class EntryCore : public CoreOf<EntryCore> {
+class EntryCore : public EntryColumns {
  public:
-    static constexpr const char* kTableName = "Entries";
-    static const char kSchema[];
-    static const SQLite::Table::IndexSpec kSchemaIndexes[];
-    static const SQLite::Table::TriggerSpec kSchemaTriggers[];
-
-    /// The positions of the columns, behind "rowID".
-    enum ColumnID : int {
-        Identifier = 0,
-        ID,
-        Title,
-        Rights,
-        Content,
-        ContentHash,
-        Summary,
-        SummaryHash,
-        XMLRepresentation,
-        XMLRepresentationHash,
-        DateUpdated,
-        TimeZoneUpdated,
-        DatePublished,
-        TimeZonePublished,
-        DateCreated,
-        TimeZoneCreated,
-        BaseURL,
-        AlternateURL,
-        Author,
-        Feed,
-        Current,
-        Tombstone,
-        Read,
-        Flagged,
-        LocalDateCreated,
-        LocalDateUpdated,
-        LocalDateXMLChanged,
-        LocalDateFlagsUpdated,
-    };
-
-    using CoreOf::CoreOf;
-
-    /// The columns in the order of the table.
-    static const SQLite::ColumnList& columnList();
+    using EntryColumns::EntryColumns;
 
     /// The stored entry of an identifier, or null. Throws `AssertionFailure` for null.
     static Foundation::Returner<EntryCore> getEntryWithIdentifier(Foundation::String* identifier);
@@ -102,6 +59,9 @@ class EntryCore : public CoreOf<EntryCore> {
 
     AuthorCore* getAuthor() const;
     void setAuthor(AuthorCore* author);
+    /// By way of the agent where the row may not be changed here. Whether the author could be put
+    /// into the file; throws if a call fails.
+    bool public_setAuthor(AuthorCore* author);
     SQLite::RowIterator<AuthorCore> getAuthors(const char* condition) const;
     SQLite::RowIterator<AuthorCore> getContributors(const char* condition) const;
     /// Takes the author, unless that is nobody or there is another one.
@@ -120,6 +80,19 @@ class EntryCore : public CoreOf<EntryCore> {
     /// The feed, which may be null, must outlive the link if it is not stored.
     void setFeed(FeedCore* feed);
 
+    // Flags.
+
+    /// Sets it, with the date of the change, and counts the feed's unread entries again.
+    void setRead(bool read);
+    /// Sets it, with the date of the change.
+    void setFlagged(bool flagged);
+    /// Sets both with one date. Whether one was different.
+    bool changeFlags(bool read, bool flagged, bool updateCounts);
+    /// By way of the agent where the row may not be changed here. True but for a failed call, which
+    /// throws.
+    bool public_setRead(bool read);
+    bool public_setFlagged(bool flagged);
+
     // Dates and order.
 
     /// Fills in the date and zone of publication where they are empty.
@@ -129,46 +102,45 @@ class EntryCore : public CoreOf<EntryCore> {
     /// A number that grows in the order of entries: the ID or, without one, `mSortValue`.
     std::uint64_t getSortValue() const;
 
-    void saveChanges() override;
-    OVObject* createOVObject() override;
+    // Merging.
 
-    SQLite::ScalarColumn<Foundation::String> mIdentifier{this};  ///< a hash
-    SQLite::ScalarColumn<Foundation::String> mID{this};          ///< the document's
-    SQLite::ScalarColumn<Foundation::String> mTitle{this};
-    SQLite::ScalarColumn<Foundation::String> mRights{this};
-    SQLite::ToOneColumn<ContentCore, false> mContent{this};
-    SQLite::ScalarColumn<Foundation::String> mContentHash{this};
-    SQLite::ToOneColumn<ContentCore, false> mSummary{this};
-    SQLite::ScalarColumn<Foundation::String> mSummaryHash{this};
-    SQLite::ToOneColumn<ContentCore, false> mXMLRepresentation{this};  ///< the source
-    SQLite::ScalarColumn<Foundation::String> mXMLRepresentationHash{this};
-    SQLite::ScalarColumn<Foundation::Date> mDateUpdated{this};
-    SQLite::ScalarColumn<Foundation::TimeZone> mTimeZoneUpdated{this};
-    SQLite::ScalarColumn<Foundation::Date> mDatePublished{this};
-    SQLite::ScalarColumn<Foundation::TimeZone> mTimeZonePublished{this};
-    SQLite::ScalarColumn<Foundation::Date> mDateCreated{this};
-    SQLite::ScalarColumn<Foundation::TimeZone> mTimeZoneCreated{this};
-    SQLite::ScalarColumn<Foundation::URL> mBaseURL{this};
-    SQLite::ScalarColumn<Foundation::URL> mAlternateURL{this};  ///< the entry's page
-    SQLite::ToOneColumn<AuthorCore, false> mAuthor{this};
-    SQLite::ToOneColumn<FeedCore, true> mFeed{this};
-    SQLite::ScalarColumn<bool> mCurrent{this};    ///< still in the feed's document
-    SQLite::ScalarColumn<bool> mTombstone{this};  ///< kept for templates; no behaviour here
-    SQLite::ScalarColumn<bool> mRead{this};
-    SQLite::ScalarColumn<bool> mFlagged{this};
-    SQLite::ScalarColumn<Foundation::Date> mLocalDateCreated{this};     ///< first seen here
-    SQLite::ScalarColumn<Foundation::Date> mLocalDateUpdated{this};     ///< data changed here
-    SQLite::ScalarColumn<Foundation::Date> mLocalDateXMLChanged{this};  ///< source changed here
-    /// Read or flagged changed.
-    SQLite::ScalarColumn<Foundation::Date> mLocalDateFlagsUpdated{this};
-    SQLite::ToManyColumn<EnclosureCore> mEnclosures{this, "entry"};
-    std::uint64_t mSortValue = 0;  ///< the place among entries that are not stored
+    /// Makes this entry what `newEntry` is, and whether that changed it. What is null or empty
+    /// there clears what is here with `force`, and leaves it alone without.
+    bool updateFrom(const Foundation::Ref<EntryCore>& newEntry, bool force);
+    void updateAuthorsFrom(const EntryCore* newEntry);
+    void updateEnclosuresFrom(const EntryCore* newEntry);
+
+    // The source, as XML. Null without a source, or if it is no XML.
+
+    /// The entry's element or, `stripped`, only what in it is not in the columns.
+    Foundation::Returner<XMLElement> getXMLElement(bool stripped) const;
+    Foundation::Returner<XMLElement> _parseXMLRepresentation() const;
+    /// Takes out of an element of Atom what is in the columns and, unless `removeOnly`, puts in
+    /// what is in them now. Gives the MIME type of the result.
+    const char* _updateAtomXML(XMLElement& element, bool removeOnly) const;
+
+    /// Deletes it with its contents, its enclosures and, if it is archived, its file.
+    void deleteRow() override;
+    void saveChanges() override;
+    /// Throws `NetException` with `OVReadOnlyError` for all but the flags.
+    void ipcWillChangeColumn(int column) override;
+    /// Plans a sync.
+    void ipcDidChangeColumn(int column) override;
+    OVObject* createOVObject() override;
 
  private:
     using ContentColumn = SQLite::ToOneColumn<ContentCore, false>;
 
+    void deleteChildren();
+    void startUpdate(const EntryCore& newEntry);
+    void takeCurrent(const EntryCore& newEntry);
+    void takeTexts(EntryCore& newEntry, bool replace);
+    void takeSource(EntryCore& newEntry, bool replace);
+    void updateEnclosure(EnclosureCore& enclosure, const EnclosureCore& newEnclosure);
+    void dropEnclosure(EnclosureCore* enclosure);
+    void insertEnclosure(const EnclosureCore& newEnclosure);
     ContentColumn& contentColumn(std::string_view name);
-    void _setContentColumn(ContentColumn& column, ContentCore* content);
+    void _setContentColumn(ContentColumn& column, const char* name, ContentCore* content);
     void replaceContent(ContentColumn& column, ContentCore* present, ContentCore* content);
     Foundation::String* hashOf(const ContentColumn& column,
                                SQLite::ScalarColumn<Foundation::String>& stored) const;

@@ -1,4 +1,5 @@
 #include "Foundation/Logger.h"
+#include "Model/AgentLink.h"
 #include "Model/AuthorCore.h"
 #include "Model/EnclosureCore.h"
 #include "Model/EntryCore.h"
@@ -42,6 +43,21 @@ void EntryCore::setAuthor(AuthorCore* author) {
     mAuthor.setValue(author);
 }
 
+bool EntryCore::public_setAuthor(AuthorCore* author) {
+    if (isChangeable()) {
+        setAuthor(author);
+        return true;
+    }
+    const Ref<AuthorCore> stored = author ? author->addToDatabase() : nullptr;
+    if (author && !stored.get()) {
+        Foundation::gWarn.log("Couldn't add author to database");
+        return false;
+    }
+    AgentLink::current().setAuthor(this, stored.get());
+    mAuthor.unload();
+    return true;
+}
+
 RowIterator<AuthorCore> EntryCore::getAuthors(const char*) const {
     BasicRowIterator::NewRows rows;
     if (AuthorCore* author = getAuthor()) rows.emplace_back(author);
@@ -58,7 +74,7 @@ void EntryCore::addToAuthors(AuthorCore* author) {
     if (present && !IsContentEqual(present, author)) {
         gLogSub.log("    EntryCore: Multiple authors not supported yet (ignoring subsequent ones)");
     } else if (!present) {
-        setAuthor(author);
+        public_setAuthor(author);
     }
 }
 

@@ -1,13 +1,19 @@
 #pragma once
 
+#include "Foundation/ArrayOf.h"
 #include "Foundation/NotificationNames.h"
 #include "Model/CoreOf.h"
 #include "SQLite/ScalarColumn.h"
 #include "SQLite/ToOneColumn.h"
 
+namespace Foundation {
+class MIMEType;
+}
+
 namespace Orvane {
 
 class ClientCore;
+class EnclosureCore;
 class FeedCore;
 
 /// A client's link to a feed, with its settings for it: a row of "Subscriptions". The one without a
@@ -58,6 +64,20 @@ class SubscriptionCore : public CoreOf<SubscriptionCore> {
     bool updateUnreadCount();
 
     OVObject* createOVObject() override;
+
+    // Which enclosures are downloaded without being asked for.
+
+    /// MIME types joined by tabs, as they are stored; an empty text for null.
+    static Foundation::StringReturner serializeEnclosureTypes(
+        const Foundation::ArrayOf<Foundation::String>* types);
+    /// The other way; null for null.
+    static Foundation::Returner<Foundation::ArrayOf<Foundation::String>> deserializeEnclosureTypes(
+        const Foundation::String* types);
+    Foundation::Returner<Foundation::ArrayOf<Foundation::String>> getEnclosureTypes() const;
+    /// Whether the type, which may be null, is on the list; all are on one that is empty.
+    bool willAutoDownload(const Foundation::MIMEType* type) const;
+    /// Whether the subscription wants the file. One of unknown length is never too large.
+    bool willAutoDownload(const EnclosureCore* enclosure) const;
 
     SQLite::ToOneColumn<ClientCore, true> mClient{this};     ///< the owner
     SQLite::ToOneColumn<FeedCore, true> mFeed{this};         ///< none in the settings row

@@ -1,5 +1,6 @@
 #include "Model/AuthorCore.h"
 
+#include "Model/EntryTest.h"
 #include "Model/ModelTest.h"
 #include "Model/Values.h"
 
@@ -99,4 +100,55 @@ TEST_F(AuthorCoreTest, FindsNobodyWhileTheDatabaseIsClosed) {
     db().close(true);
     const Ref<AuthorCore> found = author("Ann", nullptr, nullptr)->findInDatabase();
     EXPECT_EQ(found.get(), nullptr);
+}
+
+TEST_F(AuthorCoreTest, BecomesTheRowWhereThereIsNone) {
+    const Ref<AuthorCore> ann = author("Ann", nullptr, nullptr);
+    const Ref<AuthorCore> added = ann->addToDatabase();
+    EXPECT_EQ(added.get(), ann.get());
+    EXPECT_EQ(count("Authors where name='Ann'"), 1);
+    const Ref<AuthorCore> known = author("Ann", nullptr, nullptr)->addToDatabase();
+    EXPECT_EQ(known.get(), ann.get());
+    EXPECT_EQ(count("Authors"), 1);
+}
+
+TEST_F(AuthorCoreTest, AsksTheAgentToMakeTheRow) {
+    saved("Bob", nullptr, nullptr);
+    reopen(false);
+    RecordingAgent agent;
+    agent.created = author("created", nullptr, nullptr);
+    const Ref<AuthorCore> ann = author("Ann", "a@example.org", "http://example.org/");
+    ann->mContactBookUID.setValue(str("uid"));
+    Support::LogCapture log;
+    const Support::LoggingOn on({&gLogAPI});
+    const Ref<AuthorCore> added = ann->addToDatabase();
+    EXPECT_EQ(added.get(), agent.created);
+    EXPECT_EQ(agent.calls, "createAuthor(Ann,a@example.org,http://example.org/,uid) ");
+    EXPECT_TRUE(
+        log.contains("[API] Asking agent to add " + textOf(ann->toString()) + " to db ..."));
+    EXPECT_TRUE(log.contains("[API] AuthorCore: ...created " + textOf(agent.created->toString())));
+    agent.calls.clear();
+    const Ref<AuthorCore> bob = author("Bob", nullptr, nullptr)->addToDatabase();
+    EXPECT_EQ(bob->getRowID(), 1);
+    EXPECT_EQ(agent.calls, "");
+}
+
+TEST_F(AuthorCoreTest, SetsItsContactWhereItMayBeChanged) {
+    RecordingAgent agent;
+    const Ref<AuthorCore> ann = saved("Ann", nullptr, nullptr);
+    EXPECT_TRUE(ann->public_setContactBookUID(str("uid")));
+    EXPECT_EQ(textOf(ann->mContactBookUID), "uid");
+    EXPECT_EQ(agent.calls, "");
+}
+
+TEST_F(AuthorCoreTest, AsksTheAgentToSetItsContactAndReadsItAnew) {
+    saved("Ann", nullptr, nullptr);
+    reopen(false);
+    RecordingAgent agent;
+    const Ref<AuthorCore> ann = AuthorCore::getRow(1);
+    EXPECT_EQ(textOf(ann->mContactBookUID), "(null)");
+    EXPECT_TRUE(ann->public_setContactBookUID(str("uid")));
+    EXPECT_EQ(agent.calls, "setContactBookUID(1,uid) ");
+    EXPECT_FALSE(ann->mContactBookUID.isLoaded());
+    EXPECT_TRUE(ann->mName.isLoaded());
 }

@@ -347,3 +347,53 @@ TEST_F(EntryCoreTest, ListsStoredAndNewEnclosures) {
     EXPECT_TRUE(entry->getEnclosures("url='http://e.org/1'").hasRow());
     EXPECT_FALSE(entry->getEnclosures("url='http://e.org/2'").hasRow());
 }
+
+TEST_F(EntryCoreTest, AsksTheAgentForAContentAndReadsItAnew) {
+    const Ref<EntryCore> entry = newEntry();
+    entry->setContentColumn("content", nullptr, bytes("1"));
+    entry->saveChanges();
+    reopen(false);
+    RecordingAgent agent;
+    const Ref<EntryCore> read = EntryCore::getRow(1);
+    read->setContentColumn("content", nullptr, bytes("1"));
+    EXPECT_EQ(agent.calls, "");
+    read->setContentColumn("content", nullptr, bytes("2"));
+    EXPECT_FALSE(read->mContent.isLoaded());
+    read->setSummary(nullptr);
+    read->setContentColumn("XMLRepresentation", nullptr, bytes("3"));
+    read->setContent(nullptr);
+    EXPECT_EQ(agent.calls,
+              "setContent(1,content,2) setContent(1,XMLRepresentation,3) "
+              "setContent(1,content,null) ");
+    EXPECT_EQ(textOf(read->getContent()->getData()), "1");
+}
+
+TEST_F(EntryCoreTest, AsksTheAgentForAnAuthorThatItHasMade) {
+    const Ref<EntryCore> entry = newEntry();
+    entry->saveChanges();
+    author("Ann")->saveChanges();
+    reopen(false);
+    RecordingAgent agent;
+    const LogCapture log;
+    const Ref<EntryCore> read = EntryCore::getRow(1);
+    EXPECT_TRUE(read->public_setAuthor(author("Ann")));
+    EXPECT_EQ(agent.calls, "setAuthor(1,1) ");
+    EXPECT_FALSE(read->mAuthor.isLoaded());
+    EXPECT_TRUE(read->public_setAuthor(nullptr));
+    EXPECT_EQ(agent.calls, "setAuthor(1,1) setAuthor(1,0) ");
+    EXPECT_FALSE(log.contains("Couldn't"));
+    agent.calls.clear();
+    EXPECT_FALSE(read->public_setAuthor(author("Bob")));
+    EXPECT_TRUE(log.contains("[WARNING] Couldn't add author to database"));
+    EXPECT_EQ(agent.calls, "createAuthor(Bob,(null),(null),(null)) ");
+}
+
+TEST_F(EntryCoreTest, SetsItsAuthorWhereItMayBeChanged) {
+    RecordingAgent agent;
+    const Ref<EntryCore> entry = newEntry();
+    const Ref<AuthorCore> ann = author("Ann");
+    EXPECT_TRUE(entry->public_setAuthor(ann.get()));
+    EXPECT_EQ(entry->getAuthor(), ann.get());
+    EXPECT_EQ(agent.calls, "");
+    EXPECT_EQ(count("Authors"), 0);
+}
