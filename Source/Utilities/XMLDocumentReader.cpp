@@ -3,7 +3,9 @@
 #include "Foundation/Guard.h"
 #include "Foundation/Logger.h"
 #include "Foundation/UTF8.h"
+#include "Utilities/XMLNode.h"
 
+#include <glib.h>
 #include <libxml/HTMLparser.h>
 #include <libxml/SAX2.h>
 #include <libxml/parser.h>
@@ -82,28 +84,73 @@ Ref<XMLTree> readXML(std::string_view bytes, int options, std::string& error) {
     return tree;
 }
 
+/// The node after this one and what is below it, among those below `root`; null for none.
+xmlNode* nodeBehind(xmlNode* node, const xmlNode* root) {
+    while (node != root && !node->next) {
+        node = node->parent;
+    }
+    return node == root ? nullptr : node->next;
+}
+
+/// The node after this one, with those below it; null for none.
+xmlNode* nextNode(xmlNode* node, const xmlNode* root) {
+    const bool hasChildren = node->type == XML_ELEMENT_NODE && node->children;
+    return hasChildren ? node->children : nodeBehind(node, root);
+}
+
+/// Whether a node could not be read again if it were written.
+bool isUnreadable(const xmlNode* node) {
+    const std::string_view content = xmlView(node->content);
+    if (node->type == XML_COMMENT_NODE) {
+        return content.find("--") != std::string_view::npos || content.ends_with('-');
+    }
+    return node->type == XML_PI_NODE &&
+           xmlStrcasecmp(node->name, reinterpret_cast<const xmlChar*>("xml")) == 0;
+}
+
+void removeUnreadableAttributes(xmlNode* element) {
+    for (xmlAttr* attribute = element->properties; attribute;) {
+        xmlAttr* next = attribute->next;
+        if (xmlValidateName(attribute->name, 0) != 0) xmlRemoveProp(attribute);
+        attribute = next;
+    }
+}
+
+/// Takes what is no XML out of a tree that a tolerant parser made: HTML has comments and
+/// names of its own, and a document in a document brings its declaration along.
+void removeUnreadable(xmlNode* root) {
+    for (xmlNode* node = root; node;) {
+        xmlNode* next = nextNode(node, root);
+        if (node->type == XML_ELEMENT_NODE) removeUnreadableAttributes(node);
+        if (isUnreadable(node)) {
+            xmlUnlinkNode(node);
+            xmlFreeNode(node);
+        }
+        node = next;
+    }
+}
+
 /// Makes the elements of HTML, which know no namespaces, those of XHTML.
 void putIntoXHTML(xmlNode* root) {
     const std::string uri(kXHTML);
     xmlNs* xhtml = nullptr;
-    for (xmlNode* node = root; node;) {
-        if (node->type == XML_ELEMENT_NODE) {
-            xmlUnsetProp(node, reinterpret_cast<const xmlChar*>("xmlns"));
-            if (!xhtml) xhtml = xmlNewNs(root, xmlChars(uri), nullptr);
-            xmlSetNs(node, xhtml);
-        }
-        if (node->type == XML_ELEMENT_NODE && node->children) {
-            node = node->children;
-            continue;
-        }
-        while (node != root && !node->next) {
-            node = node->parent;
-        }
-        node = node == root ? nullptr : node->next;
+    for (xmlNode* node = root; node; node = nextNode(node, root)) {
+        if (node->type != XML_ELEMENT_NODE) continue;
+        xmlUnsetProp(node, reinterpret_cast<const xmlChar*>("xmlns"));
+        if (!xhtml) xhtml = xmlNewNs(root, xmlChars(uri), nullptr);
+        xmlSetNs(node, xhtml);
     }
 }
 
-Ref<XMLTree> readHTML(std::string_view bytes, std::string& error) {
+/// Whether a document is in UTF-16 or UTF-32, by its first two bytes.
+bool isWide(std::string_view bytes) {
+    using namespace std::string_view_literals;
+    const std::string_view start = bytes.substr(0, 2);
+    return start == "\xFE\xFF"sv || start == "\xFF\xFE"sv || start.find('\0') != start.npos;
+}
+
+Ref<XMLTree> readHTML(std::string_view page, std::string& error) {
+    const std::string bytes = isWide(page) ? std::string(page) : allowedInXML(page);
     Faults faults;
     const Context context(htmlNewParserCtxt(), htmlFreeParserCtxt);
     prepare(context.get(), faults);
@@ -122,6 +169,7 @@ Ref<XMLTree> readHTML(std::string_view bytes, std::string& error) {
     if (!root) throw std::bad_alloc();
     tree->setRoot(root);
     putIntoXHTML(root);
+    removeUnreadable(root);
     return tree;
 }
 
@@ -151,6 +199,45 @@ bool isNumber(std::string_view text) {
     if (isHex) text.remove_prefix(1);
     const std::size_t end = text.find_first_not_of(digits);
     return end != 0 && end != std::string_view::npos && text[end] == ';';
+}
+
+/// Whether a document names an encoding that is not UTF-8.
+bool hasOtherEncoding(std::string_view bytes) {
+    if (!bytes.starts_with("<?xml")) return false;
+    const std::string_view declaration = bytes.substr(0, bytes.find("?>"));
+    const std::size_t name = declaration.find("encoding");
+    if (name == std::string_view::npos) return false;
+    const std::size_t start = declaration.find_first_of("'\"", name);
+    if (start == std::string_view::npos) return false;
+    const std::string encoding(declaration.substr(start + 1, 5));
+    return xmlStrcasecmp(xmlChars(encoding), reinterpret_cast<const xmlChar*>("utf-8")) != 0;
+}
+
+/// UTF-8, without zeros, in which each byte that is none is read as Latin-1, what most of them are.
+std::string mendUTF8(std::string_view bytes) {
+    std::string mended;
+    while (!bytes.empty()) {
+        const char* validEnd = nullptr;
+        g_utf8_validate_len(bytes.data(), bytes.size(), &validEnd);
+        mended.append(bytes.data(), validEnd);
+        bytes.remove_prefix(static_cast<std::size_t>(validEnd - bytes.data()));
+        if (bytes.empty()) break;
+        const auto byte = static_cast<unsigned char>(bytes.front());
+        mended += static_cast<char>(0xC0 | byte >> 6);
+        mended += static_cast<char>(0x80 | (byte & 0x3F));
+        bytes.remove_prefix(1);
+    }
+    return mended;
+}
+
+/// A document with what can be mended before it is parsed.
+std::string mendBytes(std::string_view bytes) {
+    if (isWide(bytes)) return std::string(bytes);
+    const std::string allowed = allowedInXML(bytes);
+    if (!hasOtherEncoding(bytes)) return mendReferences(mendUTF8(allowed));
+    // Among escapes, "&" may be half of a character.
+    const bool hasEscapes = bytes.find('\x1B') != bytes.npos;
+    return hasEscapes ? std::string(bytes) : mendReferences(allowed);
 }
 
 /// How long the CDATA section or comment at the start of a text is; 0 if there is none.
@@ -204,10 +291,8 @@ Ref<XMLTree> readXMLDocument(std::string_view bytes, XMLTolerance tolerance, std
     }
     if (tolerance == XMLTolerance::None) return readXML(bytes, 0, error);
     if (tolerance == XMLTolerance::HTML) return readHTML(bytes, error);
-    // Where there are zeros the text is not in an encoding that has ASCII's "&".
-    const bool canBeMended = bytes.find('\0') == std::string_view::npos;
-    const Ref<XMLTree> tree = canBeMended ? readXML(mendReferences(bytes), XML_PARSE_RECOVER, error)
-                                          : readXML(bytes, XML_PARSE_RECOVER, error);
+    const Ref<XMLTree> tree = readXML(mendBytes(bytes), XML_PARSE_RECOVER, error);
+    if (tree) removeUnreadable(tree->root());
     const bool allowHTML = tolerance == XMLTolerance::XMLOrHTML;
     if (allowHTML && (!tree || isPage(*tree))) return readHTML(bytes, error);
     return tree;

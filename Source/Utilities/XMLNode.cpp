@@ -3,6 +3,7 @@
 #include "Foundation/AssertionFailure.h"
 #include "Utilities/XMLElement.h"
 
+#include <libxml/entities.h>
 #include <libxml/tree.h>
 
 #include <functional>
@@ -23,6 +24,17 @@ const xmlNode* nodeBehind(const xmlNode* node, const xmlNode* top) {
         node = node->parent;
     }
     return node == top ? nullptr : node->next;
+}
+
+/// libxml2 writes the URIs of namespaces as they stand, marks and all.
+void escapeNamespaces(xmlNs* first) {
+    for (xmlNs* ns = first; ns; ns = ns->next) {
+        if (xmlView(ns->href).find_first_of("&<>") == std::string_view::npos) continue;
+        xmlChar* escaped = xmlEncodeSpecialChars(nullptr, ns->href);
+        if (!escaped) throw std::bad_alloc();
+        xmlFree(const_cast<xmlChar*>(ns->href));
+        ns->href = escaped;
+    }
 }
 
 bool isText(const xmlNode* node) {
@@ -109,6 +121,11 @@ Ref<XMLTree> XMLNode::copyToTree() const {
     xmlNode* copy = xmlDocCopyNode(mNode, tree->document(), 1);
     if (!copy) throw std::bad_alloc();
     tree->setRoot(copy);
+    for (const xmlNode* node = copy; node;) {
+        if (node->type == XML_ELEMENT_NODE) escapeNamespaces(node->nsDef);
+        const bool hasChildren = node->type == XML_ELEMENT_NODE && node->children;
+        node = hasChildren ? node->children : nodeBehind(node, copy);
+    }
     return tree;
 }
 

@@ -46,7 +46,7 @@ class XMLNode : public Foundation::RefCounted {
 
     /// The object of a node's own class. Null for null.
     static Foundation::Returner<XMLNode> wrap(XMLTree* tree, _xmlNode* node);
-    /// A tree whose root is a copy of the node, complete in itself.
+    /// A tree whose root is a copy of the node, complete in itself, for writing.
     Foundation::Ref<XMLTree> copyToTree() const;
 
  private:

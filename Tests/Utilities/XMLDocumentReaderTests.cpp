@@ -94,6 +94,26 @@ TEST(XMLDocumentReader, WritesTheNamespaceOfAPageOnce) {
               "<html xmlns=\"http://www.w3.org/1999/xhtml\"><body><p>a<br/></p></body></html>");
 }
 
+TEST(XMLDocumentReader, MendsWhatIsNotInItsEncoding) {
+    EXPECT_EQ(read("<a b='\xE9'>caf\xE9 \xC3\xA9</a>", XMLTolerance::XML),
+              "<a b=\"\xC3\xA9\">caf\xC3\xA9 \xC3\xA9</a>");
+    EXPECT_EQ(read("<?xml version='1.0' encoding='UTF-8'?><a>\xE9</a>", XMLTolerance::XML),
+              "<a>\xC3\xA9</a>");
+    EXPECT_EQ(read("<?xml version='1.0' encoding='iso-8859-1'?><a>\xC3\xA9</b>", XMLTolerance::XML),
+              "<a>\xC3\x83\xC2\xA9</a>");
+    EXPECT_EQ(read(std::string("\xFF\xFE<\0a\0>\0\xE9\0", 10), XMLTolerance::XML),
+              "<a>\xC3\xA9</a>");
+    EXPECT_EQ(read(std::string("<a>\x01x\0y</a>", 11), XMLTolerance::XML), "<a>xy</a>");
+}
+
+TEST(XMLDocumentReader, LeavesNothingThatCouldNotBeReadAgain) {
+    EXPECT_EQ(read("<a><?xml version='1.0'?><b></a>", XMLTolerance::XML), "<a><b/></a>");
+    EXPECT_EQ(read("<p>x<!-- a -- b --><!--c--->y<!--z--></p>", XMLTolerance::HTML),
+              "<html xmlns=\"http://www.w3.org/1999/xhtml\"><body><p>xy<!--z--></p></body></html>");
+    EXPECT_EQ(read("<p .x='1' y='2'>\x02</p>", XMLTolerance::HTML),
+              "<html xmlns=\"http://www.w3.org/1999/xhtml\"><body><p y=\"2\"/></body></html>");
+}
+
 TEST(XMLDocumentReader, ReplacesTheDocumentsOwnEntities) {
     EXPECT_EQ(read("<!DOCTYPE a [<!ENTITY x 'y'>]><a b='&x;'>&x;</a>", XMLTolerance::None),
               "<a b=\"y\">y</a>");

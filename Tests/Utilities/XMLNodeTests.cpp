@@ -89,3 +89,10 @@ TEST(XMLNode, KeepsItsNamespacesWhenItIsDetached) {
     text->detach();
     EXPECT_EQ(xmlOf(*text), "x");
 }
+
+TEST(XMLNode, WritesTheMarksInNamespaces) {
+    const std::string xml = "<a xmlns=\"urn:x?a&amp;b\"><b/></a>";
+    const Ref<XMLElement> element = parse(xml);
+    EXPECT_EQ(xmlOf(*element), xml);
+    EXPECT_EQ(Ref<String>(element->ov_namespace())->utf8(), "urn:x?a&b");
+}
