@@ -21,6 +21,8 @@ std::atomic<int> sInsideLogCall = 0;
 std::atomic<unsigned> sExceptionHits = 0;
 std::atomic<LogSink*> sSink = nullptr;
 
+constexpr std::size_t kIndentationStep = 4;  ///< blanks
+
 // Reading a preference may itself log, on a facility that is not settled yet. Until the reader is
 // done such a facility is off, and stays unsettled.
 thread_local bool sIsAskingPreferences = false;
@@ -98,7 +100,9 @@ void Logger::alwaysLogV(const char* format, std::span<const OVFormatArgument> ar
         _init();
         const InsideLogCall inside;
         ++mLineCount;
-        currentSink().write(*this, OVFormatV(format, arguments));
+        std::string line(mIndentation * kIndentationStep, ' ');
+        line += OVFormatV(format, arguments);
+        currentSink().write(*this, line);
     } catch (...) {
         // A line that cannot be written is lost: its caller must not fail for it.
         std::fputs("Orvane: a line of the log could not be written\n", stderr);

@@ -23,7 +23,8 @@ struct Logger {
     std::int32_t mState = 0;
     bool mDisabled = false;
     bool mAlways = false;
-    std::uint32_t mLineCount = 0;  ///< lines written
+    std::uint32_t mLineCount = 0;    ///< lines written
+    std::uint32_t mIndentation = 0;  ///< how many steps its lines are moved in
 
     /// Settles whether the facility logs. Every other operation calls it.
     void _init();
@@ -40,6 +41,13 @@ struct Logger {
             [&](std::span<const OVFormatArgument> list) { alwaysLogV(format.text(), list); },
             arguments...);
     }
+
+    /// Moves the lines to come in by one step, or back out again; not beyond the margin.
+    void indent() { ++mIndentation; }
+    void outdent() {
+        if (mIndentation > 0) --mIndentation;
+    }
+    void resetIndentation() { mIndentation = 0; }
 
     /// Writes a line.
     void alwaysLogV(const char* format, std::span<const OVFormatArgument> arguments) noexcept;

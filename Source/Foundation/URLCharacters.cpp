@@ -92,8 +92,11 @@ std::string cleanURLText(std::string_view text) {
         const char* const at = &text[i];
         if (c == '%') return isURLEscape(text, i);
         if (c == '#') return !std::exchange(seenFragment, true);
-        if (c == '[' || c == ']') {
-            return !literal.empty() && (at == &literal.front() || at == &literal.back());
+        if (isURLBracket(c)) {
+            const bool isInHost =
+                at >= authority.data() && at < authority.data() + authority.size();
+            return !isInHost ||
+                   (!literal.empty() && (at == &literal.front() || at == &literal.back()));
         }
         if (c == '@' && lastAt && at >= authority.data() && at <= lastAt) return at == lastAt;
         return isURLPathCharacter(c) || c == '/' || c == '?';

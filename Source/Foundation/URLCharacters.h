@@ -28,6 +28,11 @@ constexpr bool isURLSubDelimiter(char c) {
 constexpr bool isURLPathCharacter(char c) {
     return isURLUnreserved(c) || isURLSubDelimiter(c) || c == ':' || c == '@';
 }
+/// Kept for addresses in the host, but used everywhere behind it, and sent as they are by whoever
+/// reads URLs as browsers do.
+constexpr bool isURLBracket(char c) {
+    return c == '[' || c == ']';
+}
 
 /// Whether a "%" with two hexadecimal digits stands at `index`.
 constexpr bool isURLEscape(std::string_view text, std::size_t index) {
@@ -49,8 +54,8 @@ std::optional<std::string> unescapeURLText(std::string_view text, std::string_vi
 
 /// Makes what people write for a URL into one as far as escapes can: every byte that a URL cannot
 /// hold where it stands is escaped. Valid escapes stay, and so do "#" before the fragment and
-/// brackets around the host; a further "#", other brackets, "%" without two digits and an "@" in
-/// a user's name are escaped.
+/// brackets around and behind the host; a further "#", other brackets, "%" without two digits and
+/// an "@" in a user's name are escaped.
 std::string cleanURLText(std::string_view text);
 
 }  // namespace Foundation

@@ -78,7 +78,9 @@ bool parseAuthority(std::string_view authority, URLParts& parts) {
 }
 
 bool isPath(const URLParts& parts) {
-    const auto isAllowed = [](char c) { return isURLPathCharacter(c) || c == '/'; };
+    const auto isAllowed = [](char c) {
+        return isURLPathCharacter(c) || c == '/' || isURLBracket(c);
+    };
     if (!consistsOf(parts.path, isAllowed)) return false;
     // A colon in the first segment would read as the end of a scheme.
     if (parts.scheme || parts.host) return true;
@@ -86,7 +88,9 @@ bool isPath(const URLParts& parts) {
 }
 
 bool isQueryOrFragment(std::string_view text) {
-    return consistsOf(text, [](char c) { return isURLPathCharacter(c) || c == '/' || c == '?'; });
+    return consistsOf(text, [](char c) {
+        return isURLPathCharacter(c) || c == '/' || c == '?' || isURLBracket(c);
+    });
 }
 
 /// The path of a reference seen from `base` (section 5.2.3).

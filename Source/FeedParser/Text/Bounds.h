@@ -30,6 +30,32 @@ inline constexpr std::size_t kTidyBytes = 64U << 20;
 /// After how many seconds with nothing to do that program ends.
 inline constexpr int kTidyIdleSeconds = 60;
 
+/// After how many errors in a document libxml2 is stopped. There are documents for which it would
+/// never end.
+inline constexpr int kParserErrors = 1000;
+/// How many tags a document may have. Each is an element or an end of one, which cost a hundred
+/// times what the shortest of them takes in the document.
+inline constexpr std::size_t kTags = 1000000;
+/// How many attributes a tag may have. libxml2 compares each with all others.
+inline constexpr std::size_t kAttributes = 1000;
+/// How long the declarations in a DOCTYPE may be, in bytes, and how many "%" there may be in them.
+inline constexpr std::size_t kSubsetBytes = 65536;
+inline constexpr std::size_t kSubsetPercents = 32;
+/// How many bytes of attributes such declarations may give to all elements together, at most.
+inline constexpr std::size_t kDefaultAttributeBytes = 8U << 20;
+/// How many bytes the entities in one attribute may come to.
+inline constexpr std::size_t kAttributeBytes = 65536;
+/// How many bytes of XML the elements of a document may get, one within the other, for each byte of
+/// the document, and how many at least.
+inline constexpr std::size_t kRawXMLFactor = 16;
+inline constexpr std::size_t kRawXMLBytes = 1U << 20;
+/// How many entries a document may have, and an entry enclosures.
+inline constexpr std::size_t kEntries = 20000;
+inline constexpr std::size_t kEnclosures = 1000;
+/// How long the processor may work on parsing a document, in seconds: as such, and for each MiB.
+inline constexpr double kParseSeconds = 0.5;
+inline constexpr double kParseSecondsPerMiB = 0.25;
+
 /// Logs that a document has reached a bound.
 void logHit(const char* bound, std::uint64_t value);
 

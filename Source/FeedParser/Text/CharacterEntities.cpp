@@ -7,10 +7,7 @@ namespace Orvane {
 
 namespace {
 
-struct Entity {
-    const char* name;
-    char16_t character;
-};
+using Entity = CharacterEntities::Entity;
 
 // HTML 4.01, section 24, in the order of the characters, and "apos" of XML 1.0, section 4.6. "tau"
 // is left out, so that "Tau" is a name of one form.
@@ -132,6 +129,10 @@ constexpr std::array<Slot, kSlots> makeSlots() {
 constexpr std::array<Slot, kSlots> kNames = makeSlots();
 
 }  // namespace
+
+std::span<const Entity> CharacterEntities::all() {
+    return kEntities;
+}
 
 char16_t CharacterEntities::find(std::string_view name) {
     if (name.empty() || name.size() > kLongestName) return 0;

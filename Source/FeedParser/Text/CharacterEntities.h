@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstddef>
+#include <span>
 #include <string_view>
 
 namespace Orvane {
@@ -8,6 +9,14 @@ namespace Orvane {
 /// The characters that HTML has names for: the 252 of HTML 4.01, and XML's "apos".
 struct CharacterEntities {
     static constexpr std::size_t kLongestName = 8;
+
+    struct Entity {
+        const char* name;
+        char16_t character;
+    };
+
+    /// All names but "tau", in the order of their characters.
+    static std::span<const Entity> all();
 
     /// The character of a name without "&" and ";"; U+0000 if there is none.
     ///

@@ -1,0 +1,27 @@
+#include "FeedParser/PageContext.h"
+
+#include "FeedParser/BaseContext.h"
+#include "FeedParser/LinkContext.h"
+
+namespace Orvane::FeedParser {
+
+using Foundation::Ref;
+using Foundation::URL;
+
+void PageContext::start() {
+    const Ref<URL> base = getBaseURL();
+    page->setBaseURL(base.get());
+}
+
+bool PageContext::handleFinishedChild(Context* child) {
+    if (child->tag == LinkTag) {
+        page->addLink(static_cast<LinkContext*>(child)->link.get());
+        return true;
+    }
+    if (child->tag != BaseTag) return false;
+    const Ref<URL> url = static_cast<BaseContext*>(child)->getURL();
+    page->setBaseURL(url.get());
+    return true;
+}
+
+}  // namespace Orvane::FeedParser

@@ -1,0 +1,209 @@
+#include "FeedParser/Parser.h"
+
+#include "FeedParser/EncodingAliases.h"
+#include "FeedParser/LibXMLHooks.h"
+#include "FeedParser/PageContext.h"
+#include "Foundation/AutoreleasePool.h"
+#include "Foundation/Guard.h"
+#include "Foundation/Logger.h"
+#include "SQLite/RowIterator.h"
+
+#include <libxml/encoding.h>
+#include <libxml/xmlreader.h>
+#include <limits>
+
+namespace Orvane::FeedParser {
+
+using Foundation::AutoreleasePool;
+using Foundation::Data;
+using Foundation::gWarn;
+using Foundation::Ref;
+using Foundation::String;
+using Foundation::URL;
+
+namespace {
+
+constexpr int kAttempts = 4;
+constexpr int kTidyingAttempt = 1;
+
+/// The encoding that an attempt forces upon the document; null for the one that it declares.
+const char* forcedEncoding(int attempt) {
+    switch (attempt) {
+        case 2:
+            return "CP1252";
+        case 3:
+            return "UTF-8";
+        default:
+            return nullptr;
+    }
+}
+
+void readerError(void* parser, const char* message, xmlParserSeverities severity,
+                 xmlTextReaderLocatorPtr locator) {
+    if (!parser) return;
+    Foundation::callGuarded(__PRETTY_FUNCTION__, [&] {
+        static_cast<Parser*>(parser)->handleError(message, severity, locator);
+    });
+}
+
+}  // namespace
+
+/// What libxml2 holds and has set while an attempt lasts, in the order in which that is made.
+class Parser::Attempt : Foundation::Uncopyable {
+ public:
+    explicit Attempt(Parser& parser) : mParser(parser), mHooks(parser) {}
+    ~Attempt() {
+        // Closing frees the document as well, unless its first element was seen.
+        mNextDocument.release();
+        xmlTextReaderClose(mParser.mReader);
+        xmlFreeTextReader(std::exchange(mParser.mReader, nullptr));
+        xmlFreeDoc(std::exchange(mParser.mDoc, nullptr));
+    }
+
+ private:
+    Parser& mParser;
+    LibXMLHooks mHooks;
+    EntitySubset::NextDocument mNextDocument;
+};
+
+Parser::Parser(Data* data, URL* url) : mInfo(new Info(this, url)), mData(data) {
+    const AutoreleasePool pool;
+    [[maybe_unused]] static const bool sIsSetUp = [] {
+        registerEncodingAliases();
+        EntitySubset::shared();
+        return true;
+    }();
+    startParsing();
+    postprocess();
+}
+
+Parser::~Parser() {
+    // The result may outlive the parser.
+    if (mInfo.get()) mInfo->parser = nullptr;
+}
+
+void Parser::startParsing() {
+    do {
+        mFatalError = false;
+        attemptParse();
+    } while (mFatalError && mAttempt != kAttempts);
+    gLogParser.log("Finished parsing; mAttempt=%i, mFatalError=%i", mAttempt, mFatalError);
+}
+
+void Parser::attemptParse() {
+    gLogParser.log("Beginning attempt #%i", mAttempt + 1);
+    if (mAttempt == kTidyingAttempt && !tidyDocument()) return;
+    mAttemptCount = mAttempt + 1;
+    if (Data::asBytes(mData.get()).isEmpty()) return;
+    {
+        Attempt attempt(*this);
+        if (!openReader(attempt)) return;
+        readDocument();
+        if (mFatalError) ++mAttempt;
+        if (mAttempt == 1) learnFromFirstAttempt();
+        unwind();
+        if (mFatalError) {
+            const Ref<URL> url = mInfo->url;
+            mInfo = Ref<Info>(new Info(this, url.get()));
+        }
+    }
+    gLogParser.resetIndentation();
+    gLogParserVerbose.resetIndentation();
+    gLogParserDates.resetIndentation();
+}
+
+void Parser::clearAttempt() {
+    mErrorCount = 0;
+    mFatalError = false;
+    mBadUTF8 = false;
+    mSawFirstElement = false;
+    mRawBytes = 0;
+    mEntries = 0;
+    mStopped = false;
+    mContextStack.clear();
+}
+
+bool Parser::openReader(Attempt&) {
+    constexpr int kOptions = XML_PARSE_RECOVER | XML_PARSE_NONET | XML_PARSE_NOCDATA;
+    const Foundation::Bytes bytes = mData->asBytes();
+    const Ref<String> base = mInfo->url.get() ? mInfo->url->getString() : nullptr;
+    constexpr std::size_t kLongest = std::numeric_limits<int>::max();
+    if (bytes.getLength() <= kLongest) {
+        mReader = xmlReaderForMemory(bytes.view().data(), static_cast<int>(bytes.getLength()),
+                                     base.get() ? base->utf8().c_str() : nullptr,
+                                     forcedEncoding(mAttempt), kOptions);
+    }
+    if (!mReader) {
+        gWarn.log("FeedParser:  xmlReaderForMemory() failed!");
+        return false;
+    }
+    clearAttempt();
+    xmlTextReaderSetErrorHandler(mReader, readerError, this);
+    // References stay in the XML that contexts get, who undo them with all other escapes.
+    xmlTextReaderSetParserProp(mReader, XML_PARSER_SUBST_ENTITIES, 0);
+    Ref<Context> root = Context::newRootContext();
+    root->baseURI = reinterpret_cast<const char*>(xmlTextReaderConstBaseUri(mReader));
+    root->info = mInfo.get();
+    mContextStack.push_back(std::move(root));
+    return true;
+}
+
+void Parser::readDocument() {
+    while (!mInfo->done && xmlTextReaderRead(mReader) == 1) {
+        switch (xmlTextReaderNodeType(mReader)) {
+            case XML_READER_TYPE_END_ELEMENT:
+                handleEndElement();
+                break;
+            case XML_READER_TYPE_ELEMENT:
+                handleStartElement();
+                break;
+            default:
+                break;
+        }
+    }
+}
+
+void Parser::learnFromFirstAttempt() {
+    if (mBadUTF8) {
+        // A document that is not the UTF-8 which it claims to be is taken for Latin-1.
+        mEncoding = XML_CHAR_ENCODING_8859_1;
+    } else {
+        const xmlChar* name = xmlTextReaderConstEncoding(mReader);
+        mEncoding = xmlParseCharEncoding(reinterpret_cast<const char*>(name));
+    }
+    if (isPage()) mTidyAsHTML = true;
+}
+
+bool Parser::isPage() const {
+    if (mInfo->kind == Info::PageKind && mInfo->page.get()) return true;
+    // One that broke while it was open as well: as XML it would lose the links behind its first
+    // element without an end.
+    return mContextStack.size() > 1 && mContextStack[1]->tag == HTMLTag;
+}
+
+void Parser::unwind() {
+    while (!mContextStack.empty()) {
+        popTopAndHandleIt();
+    }
+}
+
+void Parser::postprocess() {
+    FeedCore* feed = mInfo->getFeed();
+    if (!feed) return;
+    feed->setXMLData(mData.get());
+    const bool hasAuthors = mInfo->defaultAuthors.get() || mInfo->defaultContributors.get();
+    const bool hasTime = mInfo->defaultTimePublished.get() || mInfo->defaultTimeZonePublished.get();
+    if (!hasAuthors && !hasTime) return;
+    for (auto entry = feed->getEntries(nullptr); entry.hasRow(); entry.nextRow()) {
+        const AutoreleasePool pool;
+        if (hasAuthors) {
+            entry->useDefaultAuthors(mInfo->defaultAuthors.get(), mInfo->defaultContributors.get());
+        }
+        if (hasTime) {
+            entry->useDefaultTimePublished(mInfo->defaultTimePublished.get(),
+                                           mInfo->defaultTimeZonePublished.get());
+        }
+    }
+}
+
+}  // namespace Orvane::FeedParser
