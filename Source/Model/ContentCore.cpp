@@ -38,6 +38,17 @@ Foundation::StringReturner withoutMarkup(const Foundation::Data& html) {
     return String::string(text);
 }
 
+/// What tidies contents, made once for the process.
+struct Tidiers {
+    Ref<Tidier> forHTML = Returner<Tidier>::adopted(new HTMLSnippetTidier);
+    Ref<Tidier> forXML = Returner<Tidier>::adopted(new XMLSnippetTidier);
+};
+
+Tidiers& tidiers() {
+    static Tidiers sTidiers;
+    return sTidiers;
+}
+
 }  // namespace
 
 const char ContentCore::kSchema[] =
@@ -62,19 +73,23 @@ Foundation::Data* ContentCore::getData() const {
 }
 
 void ContentCore::tidyNow() {
-    static const Ref<Tidier> sHTMLTidier = Returner<Tidier>::adopted(new HTMLSnippetTidier);
-    static const Ref<Tidier> sXMLTidier = Returner<Tidier>::adopted(new XMLSnippetTidier);
     mNeedsTidy = false;
     const Ref<Foundation::URL> base = mTidyBaseURL;
     mTidyBaseURL = nullptr;
     const Ref<Foundation::Data> data = mData.getValue();
     if (!data.get()) return;
     const bool isXML = isXMLString();
-    const Ref<Tidier>& first = isXML ? sXMLTidier : sHTMLTidier;
-    const Ref<Tidier>& second = isXML ? sHTMLTidier : sXMLTidier;
+    const Ref<Tidier> first = isXML ? tidiers().forXML : tidiers().forHTML;
+    const Ref<Tidier> second = isXML ? tidiers().forHTML : tidiers().forXML;
     Ref<Foundation::Data> tidied = first->tidy(data.get(), kUTF8, base.get());
     if (!tidied.get()) tidied = second->tidy(data.get(), kUTF8, base.get());
     mData.setValue(tidied.get());
+}
+
+void ContentCore::_setTidiers(Tidier* forHTML, Tidier* forXML) {
+    tidiers() = Tidiers();
+    if (forHTML) tidiers().forHTML = forHTML;
+    if (forXML) tidiers().forXML = forXML;
 }
 
 Foundation::StringReturner ContentCore::getComputedHash() const {

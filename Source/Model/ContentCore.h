@@ -6,6 +6,10 @@
 
 namespace Orvane {
 
+namespace FeedParser {
+class Tidier;
+}
+
 /// A text or other data with its type: a row of "Contents".
 ///
 /// What comes out of a document is mended when it is read for the first time, and not at all if it
@@ -43,6 +47,8 @@ class ContentCore : public CoreOf<ContentCore> {
     /// null.
     void tidy(Foundation::URL* base);
     bool needsTidy() const { return mNeedsTidy; }
+    /// Puts others in the place of the process's tidiers, for tests; null for the usual ones.
+    static void _setTidiers(FeedParser::Tidier* forHTML, FeedParser::Tidier* forXML);
 
     // By the type. No type counts as plain text.
 

@@ -48,6 +48,8 @@ EntryCore* EnclosureCore::getEntry() const {
 }
 
 void EnclosureCore::setEntry(EntryCore* entry) {
+    // The old entry may have the last reference. An object that nobody owns yet must not get one.
+    const Ref<EnclosureCore> self = getRefCount() > 0 ? this : nullptr;
     const Ref<EntryCore> old = mEntry.getValue();
     if (Foundation::IsEqual(old.get(), entry)) return;
     mEntry.setValue(entry);
