@@ -1,77 +1,31 @@
 #include "Model/FeedCore.h"
 
+#include "FeedParser/Text/FeedURLUtilsCore.h"
 #include "Foundation/AssertionFailure.h"
 #include "Foundation/Data.h"
 #include "Foundation/Logger.h"
 #include "Foundation/URL.h"
 #include "Model/AgentLink.h"
+#include "Model/CredentialStore.h"
+#include "Model/DocumentParser.h"
 #include "Model/EntryCore.h"
+#include "Model/FeederFactory.h"
 #include "Model/MinistryOfTruth.h"
 #include "Model/SubscriptionCore.h"
+#include "SQLite/QueryOf.h"
 #include "SQLite/Transaction.h"
+
+#include <cerrno>
 
 namespace Orvane {
 
 using Foundation::NetError;
 using Foundation::Ref;
+using Foundation::Returner;
 using Foundation::String;
-using SQLite::column;
 using SQLite::RowIterator;
 using SQLite::TableOf;
 using SQLite::Transaction;
-
-const char FeedCore::kSchema[] =
-    "rowID integer not null unique primary key, identifier text unique, id text, title text, "
-    "subtitle text, rights text, minUpdateInterval real default 0.0, dateUpdated real, "
-    "timeZoneUpdated blob, url text unique not null, alternateUrl text, iconUrl text, "
-    "logoUrl text, lastErrorDomain integer, lastErrorCode integer, redirectedUrl text, "
-    "localDateUpdated real, refreshLocalDate real, refreshHttpDate text, refreshEtag text, "
-    "refreshDataHash text, login text, publishingProtocol integer, rebuildXml integer, "
-    "feedFormat integer, linkLocalGuid text, recoverOldEntries integer default 0, "
-    "foafUrl text, localDateCreatedOfNewestEntry real";
-
-const SQLite::Table::IndexSpec FeedCore::kSchemaIndexes[] = {
-    {"Feeds_identifier", "identifier"},
-    {"Feeds_url", "url"},
-    {"Feeds_localDateUpdated", "localDateUpdated"},
-    {nullptr, nullptr},
-};
-
-const SQLite::ColumnList& FeedCore::columnList() {
-    static const SQLite::ColumnList sColumns = {
-        column<&FeedCore::mIdentifier>("identifier"),
-        column<&FeedCore::mID>("id"),
-        column<&FeedCore::mTitle>("title"),
-        column<&FeedCore::mSubtitle>("subtitle"),
-        column<&FeedCore::mRights>("rights"),
-        column<&FeedCore::mMinUpdateInterval>("minUpdateInterval"),
-        column<&FeedCore::mDateUpdated>("dateUpdated"),
-        column<&FeedCore::mTimeZoneUpdated>("timeZoneUpdated"),
-        column<&FeedCore::mURL>("url"),
-        column<&FeedCore::mAlternateURL>("alternateUrl"),
-        column<&FeedCore::mIconURL>("iconUrl"),
-        column<&FeedCore::mLogoURL>("logoUrl"),
-        column<&FeedCore::mLastErrorDomain>("lastErrorDomain"),
-        column<&FeedCore::mLastErrorCode>("lastErrorCode"),
-        column<&FeedCore::mRedirectedURL>("redirectedUrl"),
-        column<&FeedCore::mLocalDateUpdated>("localDateUpdated"),
-        column<&FeedCore::mRefreshLocalDate>("refreshLocalDate"),
-        column<&FeedCore::mRefreshHTTPDate>("refreshHttpDate"),
-        column<&FeedCore::mRefreshETag>("refreshEtag"),
-        column<&FeedCore::mRefreshDataHash>("refreshDataHash"),
-        column<&FeedCore::mLogin>("login"),
-        column<&FeedCore::mPublishingProtocol>("publishingProtocol"),
-        column<&FeedCore::mRebuildXML>("rebuildXml"),
-        column<&FeedCore::mFeedFormat>("feedFormat"),
-        column<&FeedCore::mLinkLocalGUID>("linkLocalGuid"),
-        column<&FeedCore::mRecoverOldEntries>("recoverOldEntries"),
-        column<&FeedCore::mFOAFURL>("foafUrl"),
-        column<&FeedCore::mLocalDateCreatedOfNewestEntry>("localDateCreatedOfNewestEntry"),
-        SQLite::toMany<&FeedCore::mEntries>(),
-        SQLite::toMany<&FeedCore::mSubscriptions>(),
-    };
-    return sColumns;
-}
 
 FeedCore::~FeedCore() {
     // What has an ID is pointed at by that.
@@ -87,6 +41,48 @@ FeedCore::~FeedCore() {
 
 OVObject* FeedCore::createOVObject() {
     return nullptr;
+}
+
+namespace {
+
+/// Where the feed is that a URL names, in whatever form; null if it names none.
+Foundation::URLReturner sourceOf(Foundation::URL* url) {
+    if (!FeedURLUtilsCore::isKnownURL(url)) return Foundation::URLReturner::retained(url);
+    return FeedURLUtilsCore::sourceURLForFeedURL(url);
+}
+
+}  // namespace
+
+Returner<FeedCore> FeedCore::existingFeedWithURL(Foundation::URL* url) {
+    static auto* const sQuery = TableOf<FeedCore>::instance()->rowsWhere("URL=?").release();
+    const Ref<Foundation::URL> source = sourceOf(url);
+    if (!source.get()) return nullptr;
+    sQuery->bind(1, source.get());
+    return sQuery->firstRow();
+}
+
+Returner<FeedCore> FeedCore::createFeed(Foundation::URL* url, bool persist) {
+    OV_ASSERT_AS(url != nullptr, "url");
+    const Ref<Foundation::URL> source = sourceOf(url);
+    if (!source.get()) return nullptr;
+    const FeederFactory* feeders = FeederFactory::current();
+    if (!feeders || !feeders->supportsURL(source)) {
+        Foundation::gLog.log("FeedCore: Unsupported URL '%@'", source);
+        return nullptr;
+    }
+    Ref<FeedCore> feed = Returner<FeedCore>::adopted(new FeedCore);
+    feed->mURL.setValue(source);
+    if (persist) {
+        feed->getIdentifier();
+        feed->addToTable(TableOf<FeedCore>::instance());
+        feed->saveChanges();
+    }
+    return feed;
+}
+
+Returner<FeedCore> FeedCore::createFeed(Foundation::Data* data, Foundation::URL* url) {
+    DocumentParser* parser = DocumentParser::current();
+    return parser ? parser->parseFeed(data, url) : nullptr;
 }
 
 String* FeedCore::getIdentifier() const {
@@ -106,6 +102,8 @@ void FeedCore::preloaded() {
 }
 
 RowIterator<EntryCore> FeedCore::getEntries(const char* condition) const {
+    // That they are read first does not change what the feed has.
+    if (mRecoverOldEntries) const_cast<FeedCore*>(this)->recoverOldEntries();
     return RowIterator<EntryCore>(mEntries, condition);
 }
 
@@ -158,6 +156,14 @@ void FeedCore::public_setLogin(String* login) {
     if (isChangeable()) return mLogin.setValue(login);
     AgentLink::current().setLogin(this, login);
     mLogin.unload();
+}
+
+NetError FeedCore::setPassword(String* password, bool saveInStore) {
+    mPassword = password;
+    if (!saveInStore) return NetError::None;
+    CredentialStore* store = CredentialStore::current();
+    if (!store) return {NetError::kPOSIX, ENOTSUP};
+    return store->saveInternetPassword(mURL.getValue(), mLogin.getValue(), password);
 }
 
 }  // namespace Orvane

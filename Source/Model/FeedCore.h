@@ -2,25 +2,20 @@
 
 #include "Foundation/NetError.h"
 #include "Foundation/NotificationNames.h"
-#include "Model/CoreOf.h"
+#include "Model/FeedColumns.h"
 #include "Model/FeedRefresher.h"
 #include "SQLite/RowIterator.h"
-#include "SQLite/ScalarColumn.h"
-#include "SQLite/ToManyColumn.h"
 
 #include <limits>
 
 namespace Orvane {
-
-class EntryCore;
-class SubscriptionCore;
 
 /// A source of entries, which subscriptions share: a row of "Feeds". It has its last document, and
 /// the entries that have left that, in files outside of the database (the "truth"), owns the feeder
 /// that refreshes it, and takes all that belongs to it along when it is deleted.
 ///
 /// A feed in no table, as the parser makes it or an application uses it, is in memory alone.
-class FeedCore : public CoreOf<FeedCore> {
+class FeedCore : public FeedColumns {
  public:
     // Posted in the local centre with the feed as object. The info of the last one has
     // "ErrorDomain" and "ErrorCode" if the refresh failed, and "DidChange" if it changed the feed.
@@ -34,49 +29,19 @@ class FeedCore : public CoreOf<FeedCore> {
     static constexpr double kRefreshNever = std::numeric_limits<double>::infinity();
     static double sMinimumRefreshInterval;  ///< seconds, for all feeds of the process
 
-    static constexpr const char* kTableName = "Feeds";
-    static constexpr bool kRetainRows = true;
-    static const char kSchema[];
-    static const SQLite::Table::IndexSpec kSchemaIndexes[];
-
-    /// The positions of the columns, behind "rowID".
-    enum ColumnID : int {
-        Identifier = 0,
-        ID,
-        Title,
-        Subtitle,
-        Rights,
-        MinUpdateInterval,
-        DateUpdated,
-        TimeZoneUpdated,
-        URL,
-        AlternateURL,
-        IconURL,
-        LogoURL,
-        LastErrorDomain,
-        LastErrorCode,
-        RedirectedURL,
-        LocalDateUpdated,
-        RefreshLocalDate,
-        RefreshHTTPDate,
-        RefreshETag,
-        RefreshDataHash,
-        Login,
-        PublishingProtocol,
-        RebuildXML,
-        FeedFormat,
-        LinkLocalGUID,
-        RecoverOldEntries,
-        FOAFURL,
-        LocalDateCreatedOfNewestEntry,
-    };
-
-    using CoreOf::CoreOf;
-
-    /// The columns in the order of the table.
-    static const SQLite::ColumnList& columnList();
+    using FeedColumns::FeedColumns;
 
     ~FeedCore() override;
+
+    // Making and finding feeds. A URL of the form "feed:" stands for its source.
+
+    /// The stored feed of a URL, or null.
+    static Foundation::Returner<FeedCore> existingFeedWithURL(Foundation::URL* url);
+    /// A new feed, in the database if `persist`. Null where feeds can't be fetched from the URL.
+    /// Throws `AssertionFailure` for null, `SQLite::Exception` if it cannot be saved.
+    static Foundation::Returner<FeedCore> createFeed(Foundation::URL* url, bool persist);
+    /// The feed, in memory, that a document is; null if it is none.
+    static Foundation::Returner<FeedCore> createFeed(Foundation::Data* data, Foundation::URL* url);
 
     /// The SHA-1 of the URL that the feed was first stored with, in 40 hexadecimal digits.
     Foundation::String* getIdentifier() const;
@@ -85,6 +50,7 @@ class FeedCore : public CoreOf<FeedCore> {
     // What points at the feed: all, or what meets a condition of SQL; see `BasicRowIterator`. Each
     // side of a link sets the other.
 
+    /// Reads the saved entries first, if they wait to be read.
     SQLite::RowIterator<EntryCore> getEntries(const char* condition) const;
     void addToEntries(EntryCore* entry);
     void removeFromEntries(EntryCore* entry);
@@ -112,11 +78,28 @@ class FeedCore : public CoreOf<FeedCore> {
     /// The same, queued; by way of the agent where the row may not be changed here.
     bool startRefresh();
 
+    /// Takes over what a parsed feed says of itself. False, with nothing changed, if its date is
+    /// the one of the last time and not `force`. Throws `AssertionFailure` for a feed of another
+    /// URL, `std::runtime_error` for one with another identifier.
+    bool updateFrom(FeedCore* newFeed, bool force);
+    /// How far the document has been read. Who fails in merging one puts back what was before it
+    /// was fetched, so that the next fetch brings it again.
+    struct ReadState {
+        Foundation::Ref<Foundation::Date> dateUpdated, localDateUpdated;
+        Foundation::Ref<Foundation::String> httpDate, etag, dataHash;
+    };
+    ReadState getReadState() const;
+    void setReadState(const ReadState& state);
+
     /// Of the last refresh.
     Foundation::NetError getLastError() const;
     void setLastError(Foundation::NetError error);
     /// By way of the agent where the row may not be changed here. Throws `NetException`.
     void public_setLogin(Foundation::String* login);
+    /// Keeps the password in memory, and `saveInStore` also in the user's store of passwords, for
+    /// the feed's URL and login. What went wrong with that.
+    Foundation::NetError setPassword(Foundation::String* password, bool saveInStore);
+    Foundation::String* getPassword() const { return mPassword.get(); }
 
     // Saved documents. An operation that writes throws `AssertionFailure` where the row may not be
     // changed; that a file cannot be written or deleted draws a warning.
@@ -133,45 +116,27 @@ class FeedCore : public CoreOf<FeedCore> {
     /// Null data deletes it.
     void saveEntryToFile(Foundation::String* identifier, Foundation::Data* data);
     void deleteEntryFile(Foundation::String* identifier);
+    /// Brings back the entries that have files, once, if that waits to be done; by way of the agent
+    /// where the row may not be changed here. Throws `SQLite::Exception`; that the agent cannot be
+    /// asked is reported.
+    void recoverOldEntries();
+    /// The same for one file and its bytes. Whether it worked; a failure is logged.
+    bool addEntryFromFile(Foundation::URL* url, Foundation::Data* data);
+    /// Merges the saved document as if it had just been fetched, and lets the saved entries wait
+    /// until they are asked for.
+    void recoverFromXMLData();
+
+    /// Deletes it with all its entries and files. What of these cannot be deleted is reported.
+    void deleteRow() override;
 
     /// None: clients see a feed by its subscription.
     OVObject* createOVObject() override;
 
-    SQLite::ScalarColumn<Foundation::String> mIdentifier{this};  ///< a hash
-    SQLite::ScalarColumn<Foundation::String> mID{this};          ///< the document's
-    SQLite::ScalarColumn<Foundation::String> mTitle{this};
-    SQLite::ScalarColumn<Foundation::String> mSubtitle{this};
-    SQLite::ScalarColumn<Foundation::String> mRights{this};
-    SQLite::ScalarColumn<double> mMinUpdateInterval{this};      ///< seconds between fetches
-    SQLite::ScalarColumn<Foundation::Date> mDateUpdated{this};  ///< the document's
-    SQLite::ScalarColumn<Foundation::TimeZone> mTimeZoneUpdated{this};
-    SQLite::ScalarColumn<Foundation::URL> mURL{this};           ///< as subscribed
-    SQLite::ScalarColumn<Foundation::URL> mAlternateURL{this};  ///< the site's page
-    SQLite::ScalarColumn<Foundation::URL> mIconURL{this};
-    SQLite::ScalarColumn<Foundation::URL> mLogoURL{this};
-    SQLite::ScalarColumn<long long> mLastErrorDomain{this};
-    SQLite::ScalarColumn<int> mLastErrorCode{this};
-    /// Of the last fetch; null if it was not.
-    SQLite::ScalarColumn<Foundation::URL> mRedirectedURL{this};
-    /// When the stored feed changed.
-    SQLite::ScalarColumn<Foundation::Date> mLocalDateUpdated{this};
-    SQLite::ScalarColumn<Foundation::Date> mRefreshLocalDate{this};   ///< of the last refresh
-    SQLite::ScalarColumn<Foundation::String> mRefreshHTTPDate{this};  ///< Last-Modified
-    SQLite::ScalarColumn<Foundation::String> mRefreshETag{this};
-    SQLite::ScalarColumn<Foundation::String> mRefreshDataHash{this};  ///< of the last document
-    SQLite::ScalarColumn<Foundation::String> mLogin{this};            ///< user name
-    SQLite::ScalarColumn<int> mPublishingProtocol{this};
-    SQLite::ScalarColumn<bool> mRebuildXML{this};  ///< the saved XML is to be made anew
-    SQLite::ScalarColumn<int> mFeedFormat{this};
-    SQLite::ScalarColumn<Foundation::String> mLinkLocalGUID{this};  ///< of one found by discovery
-    SQLite::ScalarColumn<bool> mRecoverOldEntries{this};  ///< saved entry files wait to be read
-    SQLite::ScalarColumn<Foundation::URL> mFOAFURL{this};
-    /// Kept by the triggers of entries.
-    SQLite::ScalarColumn<Foundation::Date> mLocalDateCreatedOfNewestEntry{this};
-    SQLite::ToManyColumn<EntryCore> mEntries{this, "feed"};
-    SQLite::ToManyColumn<SubscriptionCore> mSubscriptions{this, "feed"};
-
  private:
+    void askForOldEntries();
+    bool recoverEntry(Foundation::URL* url, Foundation::Data* data);
+    bool adoptRecovered(EntryCore* entry, Foundation::String* identifier);
+    void refreshFromFile(Foundation::URL* file);
     void refreshStarted(FeedRefresher* feeder);
     void fetchStarted(FeedRefresher* feeder);
     void refreshFinished(FeedRefresher* feeder);
@@ -179,6 +144,7 @@ class FeedCore : public CoreOf<FeedCore> {
     Foundation::Ref<Foundation::Data> mXMLData;  ///< of a feed without a file
     mutable Foundation::Ref<Foundation::URL> mEntryXMLDir;
     Foundation::Ref<FeedRefresher> mFeeder;
+    Foundation::Ref<Foundation::String> mPassword;
 };
 
 }  // namespace Orvane

@@ -1,25 +1,44 @@
+#include "Foundation/AssertionFailure.h"
 #include "Foundation/Date.h"
 #include "Foundation/DictionaryOf.h"
 #include "Foundation/Logger.h"
 #include "Foundation/NotificationCenter.h"
 #include "Foundation/Number.h"
+#include "Foundation/URL.h"
 #include "Model/AgentLink.h"
 #include "Model/FeedCore.h"
 #include "Model/FeederFactory.h"
 #include "Model/SubscriptionCore.h"
 
 #include <algorithm>
+#include <stdexcept>
 
 // When a feed is refreshed, and what its feeder tells it.
 
 namespace Orvane {
 
 using Foundation::Date;
+using Foundation::IsEqual;
 using Foundation::MutableDictionary;
 using Foundation::NetError;
 using Foundation::NotificationCenter;
 using Foundation::Number;
 using Foundation::Ref;
+
+namespace {
+
+void requireIdentity(const FeedCore& feed, const FeedCore& newFeed) {
+    const Foundation::String* mine = feed.getIdentifier();
+    const Foundation::String* theirs = newFeed.getIdentifier();
+    if (IsEqual(mine, theirs)) return;
+    Foundation::gWarn.log(
+        "FeedCore::updateFrom: newFeed's hash '%@' (for URL <%@>) doesn't match mine '%@' "
+        "(URL <%@>)",
+        theirs, newFeed.mURL.getValue(), mine, feed.mURL.getValue());
+    throw std::runtime_error("New feed's ID is different from old feed's");
+}
+
+}  // namespace
 
 double FeedCore::sMinimumRefreshInterval = 60.0;
 
@@ -76,6 +95,46 @@ bool FeedCore::refresh(bool force, bool queued) {
 bool FeedCore::startRefresh() {
     if (isChangeable()) return refresh(false, true);
     return AgentLink::current().refresh(this, true).code == 0;
+}
+
+bool FeedCore::updateFrom(FeedCore* newFeed, bool force) {
+    Foundation::URL* url = mURL.getValue();
+    gLogSub.log("Updating feed <%@>", url);
+    OV_ASSERT_AS(IsEqual(url, newFeed->mURL.getValue()), "url->isEqual(newFeed->getURL())");
+    if (mLocalDateUpdated.getValue() && getRowID() != 0) requireIdentity(*this, *newFeed);
+    Date* date = newFeed->mDateUpdated.getValue();
+    if (date && !force && IsEqual(date, mDateUpdated.getValue())) {
+        gLogSub.log("...No-op: Feed date remained %@", date);
+        return false;
+    }
+    mID.setValue(newFeed->mID);
+    Foundation::URL* redirected = newFeed->mRedirectedURL.getValue();
+    if (IsEqual(redirected, url)) redirected = nullptr;
+    if (redirected) gLogSub.log("    ...was redirected to <%@>", redirected);
+    mRedirectedURL.setValue(redirected);
+    mFeedFormat.setValue(newFeed->mFeedFormat);
+    mTitle.setValue(newFeed->mTitle);
+    mSubtitle.setValue(newFeed->mSubtitle);
+    mAlternateURL.setValue(newFeed->mAlternateURL);
+    mRights.setValue(newFeed->mRights);
+    mIconURL.setValue(newFeed->mIconURL);
+    mLogoURL.setValue(newFeed->mLogoURL);
+    mDateUpdated.setValue(date);
+    mLocalDateUpdated.setValue(Date::now());
+    return true;
+}
+
+FeedCore::ReadState FeedCore::getReadState() const {
+    return {mDateUpdated.getValue(), mLocalDateUpdated.getValue(), mRefreshHTTPDate.getValue(),
+            mRefreshETag.getValue(), mRefreshDataHash.getValue()};
+}
+
+void FeedCore::setReadState(const ReadState& state) {
+    mDateUpdated.setValue(state.dateUpdated);
+    mLocalDateUpdated.setValue(state.localDateUpdated);
+    mRefreshHTTPDate.setValue(state.httpDate);
+    mRefreshETag.setValue(state.etag);
+    mRefreshDataHash.setValue(state.dataHash);
 }
 
 void FeedCore::refreshStarted(FeedRefresher*) {

@@ -1,26 +1,29 @@
 #include "Model/FileReader.h"
 
 #include "Foundation/Data.h"
-#include "Model/MissingPort.h"
+#include "Foundation/NetError.h"
+#include "Foundation/Ref.h"
+#include "Foundation/URL.h"
 
 namespace Orvane {
 
 namespace {
 
 FileReader::Maker sMaker = nullptr;
-constinit MissingPort sMissing{"FileReader"};
 
-class NoReader : public FileReader {
+class LateReader : public FileReader {
  public:
-    Foundation::DataReturner finish() override { return nullptr; }
+    explicit LateReader(Foundation::URL* url) : mURL(url) {}
+    Foundation::DataReturner finish() override { return Foundation::Data::dataFromResource(mURL); }
+
+ private:
+    const Foundation::Ref<Foundation::URL> mURL;
 };
 
 }  // namespace
 
 std::unique_ptr<FileReader> FileReader::open(Foundation::URL* url) {
-    if (sMaker) return sMaker(url);
-    sMissing.note();
-    return std::make_unique<NoReader>();
+    return sMaker ? sMaker(url) : std::make_unique<LateReader>(url);
 }
 
 void FileReader::setMaker(Maker maker) {

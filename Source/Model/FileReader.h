@@ -13,10 +13,10 @@ class FileReader : Foundation::Uncopyable {
     using Maker = std::unique_ptr<FileReader> (*)(Foundation::URL* url);
 
     virtual ~FileReader() = default;
-    /// Waits until the file is read. Its bytes; null, with a log line, where it cannot be read.
+    /// Waits until the file is read. Its bytes; null where it cannot be read.
     virtual Foundation::DataReturner finish() = 0;
 
-    /// Begins to read. Without a maker the result reads nothing.
+    /// Begins to read. Without a maker the file is read when it is waited for.
     static std::unique_ptr<FileReader> open(Foundation::URL* url);
     /// Who makes the readers of the process; null for none.
     static void setMaker(Maker maker);

@@ -114,7 +114,7 @@ void restoreEntriesOf(FeedCore& feed) {
     const AutoreleasePool pool;
     const double start = Clock::current().now();
     gLog.log("Restoring entries of <%@> from saved XML files...", feed.mURL.getValue());
-    feed.mRecoverOldEntries.setValue(true);
+    feed.recoverFromXMLData();
     gLog.log("...Finished restoring entries in %.2f sec", Clock::current().now() - start);
 }
 

@@ -4,6 +4,8 @@
 #include "Foundation/Logger.h"
 #include "Model/FeedTest.h"
 
+#include <cerrno>
+
 using namespace Foundation;
 using namespace Orvane;
 using namespace SQLite;
@@ -20,6 +22,9 @@ class FeedCoreTest : public FeedTest {
             ids += std::to_string(entries->getRowID()) + " ";
         }
         return ids;
+    }
+    static FeedCore* found(const char* address) {
+        return FeedCore::existingFeedWithURL(url(address));
     }
     /// Puts an entry straight into the file.
     static void insertEntry(const FeedCore* feed, const char* identifier, double created,
@@ -165,4 +170,97 @@ TEST_F(FeedCoreTest, CountsUnreadEntriesByTheirIndexAlone) {
             << step;
         EXPECT_FALSE(plan.nextRow());
     }
+}
+
+TEST_F(FeedCoreTest, IsFoundByItsURL) {
+    FeedCore* feed = storedFeed();
+    storedFeed("http://example.org/other");
+    EXPECT_EQ(found("http://example.org/feed"), feed);
+    EXPECT_EQ(found("feed://example.org/feed"), feed);
+    EXPECT_EQ(found("http://example.org/none"), nullptr);
+    EXPECT_EQ(found("feeds:name&example.org/feed"), nullptr);
+    FeedCore* none = FeedCore::existingFeedWithURL(nullptr);
+    EXPECT_EQ(none, nullptr);
+}
+
+TEST_F(FeedCoreTest, IsMadeOfAURLAndStored) {
+    const FakeFeeders feeders;
+    FeedCore* feed = FeedCore::createFeed(url("http://example.org/feed"), true);
+    EXPECT_EQ(feed->getRowID(), 1);
+    EXPECT_FALSE(feed->isChanged());
+    EXPECT_EQ(db().execScalar("select count(*) from Feeds where identifier=%Q", kIdentifier), 1);
+}
+
+TEST_F(FeedCoreTest, IsMadeInMemory) {
+    const FakeFeeders feeders;
+    FeedCore* feed = FeedCore::createFeed(url("http://example.org/feed"), false);
+    EXPECT_EQ(feed->getTable(), nullptr);
+    EXPECT_EQ(count("Feeds"), 0);
+}
+
+TEST_F(FeedCoreTest, IsMadeOfTheSourceThatAFeedURLNames) {
+    const FakeFeeders feeders;
+    FeedCore* feed = FeedCore::createFeed(url("feed://example.org/feed"), true);
+    EXPECT_EQ(text(feed->mURL.getValue()), "http://example.org/feed");
+    EXPECT_EQ(text(feed->getIdentifier()), kIdentifier);
+}
+
+TEST_F(FeedCoreTest, IsNotMadeOfWhatCannotBeFetched) {
+    const FakeFeeders feeders;
+    const LoggingOn on({});
+    FeedCore* feed = FeedCore::createFeed(url("gopher://example.org/feed"), true);
+    EXPECT_EQ(feed, nullptr);
+    EXPECT_EQ(log.lines().back(), "FeedCore: Unsupported URL 'gopher://example.org/feed'");
+    feed = FeedCore::createFeed(url("feeds:name&example.org/feed"), true);
+    EXPECT_EQ(feed, nullptr);
+    EXPECT_EQ(count("Feeds"), 0);
+}
+
+TEST_F(FeedCoreTest, IsNotMadeOfNothing) {
+    try {
+        FeedCore* feed = FeedCore::createFeed(static_cast<URL*>(nullptr), true);
+        FAIL() << feed;
+    } catch (const AssertionFailure& failure) {
+        EXPECT_STREQ(failure.what(), "url");
+    }
+}
+
+TEST_F(FeedCoreTest, IsMadeOfADocument) {
+    const FakeParser parser;
+    FeedCore* feed = FeedCore::createFeed(data("feed News"), url("http://example.org/feed"));
+    EXPECT_EQ(text(feed->mTitle.getValue()), "News");
+    EXPECT_EQ(parser.lastURL, "http://example.org/feed");
+    feed = FeedCore::createFeed(data("entry 1 Post"), nullptr);
+    EXPECT_EQ(feed, nullptr);
+}
+
+TEST_F(FeedCoreTest, IsNotMadeOfADocumentWithoutAParser) {
+    FeedCore* feed = FeedCore::createFeed(data("feed News"), nullptr);
+    EXPECT_EQ(feed, nullptr);
+    EXPECT_LE(log.count("DocumentParser: nothing stands behind it"), 1);
+}
+
+TEST_F(FeedCoreTest, KeepsItsPasswordInMemoryAlone) {
+    FakeCredentials store;
+    FeedCore* feed = storedFeed();
+    EXPECT_EQ(feed->setPassword(string("secret"), false), NetError::None);
+    EXPECT_EQ(text(feed->getPassword()), "secret");
+    EXPECT_EQ(store.saved, "");
+    EXPECT_FALSE(feed->isChanged());
+}
+
+TEST_F(FeedCoreTest, PutsItsPasswordIntoTheStoreOfTheUser) {
+    FakeCredentials store;
+    FeedCore* feed = storedFeed();
+    feed->mLogin.setValue(string("ann"));
+    EXPECT_EQ(feed->setPassword(string("secret"), true), NetError::None);
+    EXPECT_EQ(store.saved, "http://example.org/feed ann secret ");
+    store.answer = {NetError::kPOSIX, EACCES};
+    EXPECT_EQ(feed->setPassword(nullptr, true), store.answer);
+    EXPECT_EQ(feed->getPassword(), nullptr);
+}
+
+TEST_F(FeedCoreTest, SaysThatThereIsNoStoreForItsPassword) {
+    EXPECT_EQ(storedFeed()->setPassword(string("secret"), true),
+              NetError(NetError::kPOSIX, ENOTSUP));
 }

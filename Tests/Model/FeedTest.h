@@ -4,6 +4,8 @@
 #include "Foundation/Date.h"
 #include "Foundation/URL.h"
 #include "Model/ClientCore.h"
+#include "Model/CredentialStore.h"
+#include "Model/DocumentParser.h"
 #include "Model/EntryCore.h"
 #include "Model/FeedCore.h"
 #include "Model/FeederFactory.h"
@@ -13,6 +15,8 @@
 #include "Utilities/FileSystem.h"
 
 #include <filesystem>
+#include <sstream>
+#include <stdexcept>
 #include <string>
 #include <vector>
 
@@ -80,6 +84,74 @@ class FakeAgent : public Orvane::UnreachableAgent {
     NetError answer;
 };
 
+/// Reads "feed TITLE" as a feed, and "entry ID TITLE" as an entry; "throw" makes it throw. It is
+/// the port of the process while it lives.
+class FakeParser : public Orvane::DocumentParser {
+ public:
+    FakeParser() { setCurrent(this); }
+    ~FakeParser() override { setCurrent(nullptr); }
+
+    Foundation::Returner<Orvane::FeedCore> parseFeed(Foundation::Data* data,
+                                                     Foundation::URL* url) override {
+        std::istringstream words = open(data, url);
+        if (kind != "feed") return nullptr;
+        Foundation::Ref<Orvane::FeedCore> feed = make<Orvane::FeedCore>();
+        feed->mURL.setValue(url);
+        feed->mTitle.setValue(word(words));
+        return feed;
+    }
+    Foundation::Returner<Orvane::EntryCore> parseEntry(Foundation::Data* data,
+                                                       Foundation::URL* url) override {
+        std::istringstream words = open(data, url);
+        if (kind != "entry") return nullptr;
+        Foundation::Ref<Orvane::EntryCore> entry = make<Orvane::EntryCore>();
+        entry->mID.setValue(word(words));
+        entry->mTitle.setValue(word(words));
+        entry->mCurrent.setValue(true);
+        return entry;
+    }
+
+    std::string calls;  ///< the documents, with a blank behind each
+    std::string lastURL;
+
+ private:
+    template <class T>
+    static Foundation::Ref<T> make() {
+        return Foundation::Returner<T>::adopted(new T);
+    }
+    static Foundation::String* word(std::istringstream& words) {
+        std::string text;
+        words >> text;
+        return Foundation::String::string(text);
+    }
+    std::istringstream open(Foundation::Data* data, Foundation::URL* url) {
+        calls += std::string(data->view()) + " ";
+        lastURL = url ? url->text() : "";
+        std::istringstream words{std::string(data->view())};
+        words >> kind;
+        if (kind == "throw") throw std::runtime_error("parser");
+        return words;
+    }
+
+    std::string kind;
+};
+
+/// Keeps what is to be stored. It is the port of the process while it lives.
+class FakeCredentials : public Orvane::CredentialStore {
+ public:
+    FakeCredentials() { setCurrent(this); }
+    ~FakeCredentials() override { setCurrent(nullptr); }
+
+    Foundation::NetError saveInternetPassword(Foundation::URL* url, Foundation::String* user,
+                                              Foundation::String* password) override {
+        saved += OVFormat("%@ %@ %@ ", url, user, password);
+        return answer;
+    }
+
+    std::string saved;
+    Foundation::NetError answer;
+};
+
 /// A test of feeds, whose files are in a directory of its own.
 class FeedTest : public ModelTest {
  protected:
@@ -145,6 +217,12 @@ class FeedTest : public ModelTest {
         return made;
     }
 
+    /// Leaves a mark behind so many times now, as processes do that go down.
+    void leaveMarks(const Foundation::URL* document, int times) const {
+        directory.writeFile(
+            "Orvane/Feeds/.parsing",
+            OVFormat("%d %.3f %s\n", times, clock.now(), document->getFileSystemRepresentation()));
+    }
     static bool exists(const std::string& file) { return std::filesystem::exists(file); }
     std::string truth(const std::string& name) const {
         return directory / ("Orvane/Feeds/" + name);

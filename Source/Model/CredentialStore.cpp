@@ -1,0 +1,23 @@
+#include "Model/CredentialStore.h"
+
+#include "Model/MissingPort.h"
+
+namespace Orvane {
+
+namespace {
+
+CredentialStore* sCurrent = nullptr;
+constinit MissingPort sMissing{"CredentialStore"};
+
+}  // namespace
+
+CredentialStore* CredentialStore::current() {
+    if (!sCurrent) sMissing.note();
+    return sCurrent;
+}
+
+void CredentialStore::setCurrent(CredentialStore* port) {
+    sCurrent = port;
+}
+
+}  // namespace Orvane
