@@ -24,8 +24,4 @@ enum class XMLTolerance {
 Foundation::Ref<XMLTree> readXMLDocument(std::string_view bytes, XMLTolerance tolerance,
                                          std::string& error);
 
-/// A document in which every reference is one that XML knows: those to characters that HTML has
-/// names for are replaced by numbers, and an "&" that begins no reference by "&amp;".
-std::string mendReferences(std::string_view bytes);
-
 }  // namespace Orvane

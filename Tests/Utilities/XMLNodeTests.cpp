@@ -68,11 +68,10 @@ TEST(XMLNode, IsTheSameAsAnotherObjectForItsNode) {
 }
 
 TEST(XMLNode, OutlivesTheObjectsAboveIt) {
-    Ref<XMLElement> inner;
-    {
+    const Ref<XMLElement> inner = [] {
         const Ref<XMLElement> element = parse("<a><b>text</b></a>");
-        inner = firstElement(*element);
-    }
+        return firstElement(*element);
+    }();
     EXPECT_EQ(xmlOf(*inner), "<b>text</b>");
 }
 

@@ -79,7 +79,7 @@ TEST(RSSAuthorParser, EndsAtAZeroByte) {
 }
 
 TEST(RSSAuthorParser, TrimsItsOwnBlanks) {
-    std::string text("\0\t\n\v\f\r a \0 b\r\f\v\n\t \0", 20);
+    std::string text("\0\t\n\v\f\r a \0 b\r\f\v\n\t \0", 19);
     RSSAuthorParser::trim(text);
     EXPECT_EQ(text, std::string("a \0 b", 5));
     std::string blank(" \0", 2);
