@@ -38,15 +38,16 @@ Foundation::StringReturner withoutMarkup(const Foundation::Data& html) {
     return String::string(text);
 }
 
-/// What tidies contents, made once for the process.
+/// What tidies contents, made once for the process. Never destroyed: the database saves rows when
+/// it ends with the process.
 struct Tidiers {
     Ref<Tidier> forHTML = Returner<Tidier>::adopted(new HTMLSnippetTidier);
     Ref<Tidier> forXML = Returner<Tidier>::adopted(new XMLSnippetTidier);
 };
 
 Tidiers& tidiers() {
-    static Tidiers sTidiers;
-    return sTidiers;
+    static auto* const sTidiers = new Tidiers;
+    return *sTidiers;
 }
 
 }  // namespace

@@ -37,7 +37,7 @@ class EntryCore : public EntryColumns {
     void assertIdentifier(Foundation::String* identifier, const char* name) const;
 
     // Contents. An entry keeps its rows of "Contents" and changes what is in them. The setters copy
-    // what they get, which may be null.
+    // what they get, which may be null, by way of the agent where the row may not be changed here.
 
     ContentCore* getContent() const;
     ContentCore* getSummary() const;

@@ -397,3 +397,30 @@ TEST_F(EntryCoreTest, SetsItsAuthorWhereItMayBeChanged) {
     EXPECT_EQ(agent.calls, "");
     EXPECT_EQ(count("Authors"), 0);
 }
+
+TEST_F(EntryCoreTest, LosesAFeedThatEndsAndWithItItsIdentity) {
+    const Ref<EntryCore> entry = make<EntryCore>();
+    {
+        const AutoreleasePool inner;
+        const Ref<FeedCore> ending = newFeed("http://e.org/ending");
+        ending->addToEntries(entry.get());
+        EXPECT_EQ(entry->getFeed(), ending.get());
+    }
+    EXPECT_EQ(entry->getFeed(), nullptr);
+    EXPECT_EQ(textOf(entry->computeIdentifier()), "(null)");
+}
+
+TEST_F(EntryCoreTest, MayLeaveWhatAloneKeepsIt) {
+    const AutoreleasePool inner;
+    EntryCore* entry = nullptr;
+    EnclosureCore* attached = nullptr;
+    {
+        const AutoreleasePool innermost;
+        entry = newEntry();
+        attached = make<EnclosureCore>();
+        entry->addToEnclosures(attached);
+    }
+    attached->setEntry(nullptr);
+    entry->setFeed(nullptr);
+    EXPECT_TRUE(feed->mEntries.getNewRows().empty());
+}
