@@ -1,13 +1,12 @@
 #include "Foundation/BusLauncher.h"
 
+#include "Foundation/ProcessBeginning.h"
 #include "Foundation/RuntimeDirectory.h"
-#include "Foundation/Uncopyable.h"
 #include "Foundation/UniqueFD.h"
 
 #include <fcntl.h>
 #include <glib.h>
 #include <poll.h>
-#include <spawn.h>
 #include <sys/file.h>
 #include <sys/socket.h>
 #include <sys/un.h>
@@ -57,38 +56,6 @@ Answer askWhoListens(const std::string& path) {
     return result == 0 || errno == EAGAIN ? Answer::Yes : Answer::No;
 }
 
-/// What the daemon's process begins with: no terminal, no descriptor of ours but `ready`, no
-/// signal held back.
-struct Beginning : Uncopyable {
-    static constexpr int kReady = 3;
-
-    explicit Beginning(int ready) {
-        posix_spawn_file_actions_init(&actions);
-        // First, for one of these numbers may be the pipe's own.
-        posix_spawn_file_actions_adddup2(&actions, ready, kReady);
-        posix_spawn_file_actions_addopen(&actions, 0, "/dev/null", O_RDONLY, 0);
-        posix_spawn_file_actions_addopen(&actions, 1, "/dev/null", O_WRONLY, 0);
-        posix_spawn_file_actions_addopen(&actions, 2, "/dev/null", O_WRONLY, 0);
-        posix_spawn_file_actions_addclosefrom_np(&actions, kReady + 1);
-        posix_spawnattr_init(&attributes);
-        sigset_t none;
-        sigset_t all;
-        sigemptyset(&none);
-        sigfillset(&all);
-        posix_spawnattr_setsigmask(&attributes, &none);
-        posix_spawnattr_setsigdefault(&attributes, &all);
-        posix_spawnattr_setflags(
-            &attributes, POSIX_SPAWN_SETSID | POSIX_SPAWN_SETSIGMASK | POSIX_SPAWN_SETSIGDEF);
-    }
-    ~Beginning() {
-        posix_spawn_file_actions_destroy(&actions);
-        posix_spawnattr_destroy(&attributes);
-    }
-
-    posix_spawn_file_actions_t actions;
-    posix_spawnattr_t attributes;
-};
-
 /// Waits until something can be read. False after the time-out or at the end of the stream.
 bool awaitWord(int fd) {
     pollfd wanted = {fd, POLLIN, 0};
@@ -114,8 +81,9 @@ bool startDaemon(const std::string& address, std::string& error) {
     }
     const UniqueFD word(fds[0]);
     UniqueFD ready(fds[1]);
-    const Beginning beginning(ready.get());
+    const ProcessBeginning beginning(ready.get());
     const std::string listen = "--address=" + address;
+    static_assert(ProcessBeginning::kGiven == 3, "as --print-address has it");
     // It forks once it listens, so that it is nobody's child and leaves no zombie behind.
     const char* arguments[] = {"dbus-daemon",       "--session",  "--fork",
                                "--nopidfile",       "--nosyslog", listen.c_str(),
