@@ -20,6 +20,7 @@ int main(int argc, char** argv) {
          {"HOME", "XDG_DATA_HOME", "XDG_CONFIG_HOME", "XDG_CACHE_HOME", "XDG_RUNTIME_DIR"}) {
         setenv(name, home.makeDirectory(name).c_str(), 1);
     }
+    setenv("ORVANE_PROGRAMS", ORVANE_BUILT_PROGRAMS, 1);
     setenv("ORVANE_RESOURCES", ORVANE_BUILT_RESOURCES, 1);
     setenv("TZ", "UTC", 1);
     setenv("OVUseSystemLog", "0", 1);

@@ -13,22 +13,26 @@ inline constexpr int kElementDepth = 200;
 /// How many inline elements may be open at once in HTML. Tidy repeats each of them in every block
 /// that begins meanwhile, and tells about each time.
 inline constexpr int kOpenInlines = 24;
+/// How many attributes of a broken element are kept. Tidy compares each with all others.
+inline constexpr int kMendedAttributes = 200;
 /// How many messages Tidy may write about one document.
 inline constexpr int kTidyReports = 100;
 
 /// What is tidied in the process itself: markup of at most so many bytes, and of no greater depth.
 inline constexpr std::size_t kInPlaceBytes = 16384;
 inline constexpr int kInPlaceDepth = 32;
-/// How long tidying one document may take, in seconds.
+/// How long tidying one document may take, in seconds, and how long the processor may work on it.
+/// The clock comes first, as long as somebody waits.
 inline constexpr double kTidySeconds = 2;
-/// How long its processor may work on it. The clock counts first unless the machine is busy.
-inline constexpr std::uint64_t kTidyProcessorSeconds = 2;
+inline constexpr std::uint64_t kTidyProcessorSeconds = 3;
 /// The address space of the program that tidies, in bytes.
-inline constexpr std::uint64_t kTidyMemory = 384ULL << 20;
-/// The largest document, and the largest result, that goes through the pipe, in bytes.
+inline constexpr std::uint64_t kTidyMemory = 320ULL << 20;
+/// The largest document that it is given, and the largest result that is taken from it, in bytes.
 inline constexpr std::size_t kTidyBytes = 64U << 20;
-/// After how many seconds with nothing to do that program ends.
-inline constexpr int kTidyIdleSeconds = 60;
+/// After how many seconds with nothing to do it ends.
+inline constexpr double kTidyIdleSeconds = 60;
+/// How long it may take to start, in seconds.
+inline constexpr double kTidyStartSeconds = 10;
 
 /// After how many errors in a document libxml2 is stopped. There are documents for which it would
 /// never end.

@@ -4,11 +4,15 @@
 
 namespace Orvane::FeedParser {
 
-/// Repairs a feed that is no well-formed XML.
+/// Repairs a feed that is no well-formed XML. Gives null for a page.
 class FeedTidier : public Tidier {
  public:
     bool setupTidyOptions() override;
     const char* getClassName() const override { return "FeedTidier"; }
+
+ private:
+    int repair(const MarkupEncoding::Text& text, Foundation::URL* baseURL,
+               std::string& output) override;
 };
 
 }  // namespace Orvane::FeedParser

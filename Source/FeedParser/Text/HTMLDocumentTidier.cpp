@@ -9,4 +9,9 @@ bool HTMLDocumentTidier::setupTidyOptions() {
            mDoc->set("output-xhtml", "yes") && mDoc->set("show-body-only", "no");
 }
 
+int HTMLDocumentTidier::repair(const MarkupEncoding::Text& text, Foundation::URL* /*baseURL*/,
+                               std::string& output) {
+    return repairHTML(text, HTMLMending::Kind::Page, output);
+}
+
 }  // namespace Orvane::FeedParser

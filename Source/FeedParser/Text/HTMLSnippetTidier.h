@@ -10,6 +10,10 @@ class HTMLSnippetTidier : public Tidier {
     HTMLSnippetTidier() { mTrim = true; }
     bool setupTidyOptions() override;
     const char* getClassName() const override { return "HTMLSnippetTidier"; }
+
+ private:
+    int repair(const MarkupEncoding::Text& text, Foundation::URL* baseURL,
+               std::string& output) override;
 };
 
 }  // namespace Orvane::FeedParser

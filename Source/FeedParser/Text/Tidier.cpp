@@ -1,7 +1,8 @@
 #include "FeedParser/Text/Tidier.h"
 
-#include "FeedParser/Text/MarkupEncoding.h"
+#include "FeedParser/Text/MarkupLook.h"
 #include "FeedParser/Text/TidyDocument.h"
+#include "FeedParser/Text/TidyHelper.h"
 #include "Foundation/AutoreleasePool.h"
 #include "Foundation/Logger.h"
 
@@ -34,6 +35,15 @@ constexpr Option kOptions[] = {
 
 bool hasNothingToRepair(std::string_view bytes) {
     return bytes.find_first_of("<&") == std::string_view::npos;
+}
+
+bool isSuccess(int code) {
+    return code == 0 || code == 1;
+}
+
+/// As Tidy calls it. "raw" leaves every byte above 127 as it is.
+const char* encodingName(const MarkupEncoding::Text& text) {
+    return text.isUTF8 ? "utf8" : "raw";
 }
 
 void trimEnd(std::string& text) {
@@ -70,7 +80,10 @@ DataReturner Tidier::tidy(Data* data, int encoding, URL* baseURL) {
     gLogTidierVerbose.log("Tidier input:\n%.*s", static_cast<int>(bytes.size()), bytes.data());
     if (hasNothingToRepair(bytes)) return DataReturner::retained(data);
 
-    TidyResult result = repair(bytes, encoding, baseURL);
+    TidyResult result =
+        MarkupLook::isSmallAndShallow(bytes)
+            ? tidyHere(bytes, encoding, baseURL)
+            : TidyHelper::getShared().tidy(getClassName(), bytes, encoding, baseURL);
     if (!result.isSuccess()) {
         gLogParser.log("Tidy failed, rc=%i (%u bytes, encoding=%i, baseURL=%@)...", result.code,
                        static_cast<unsigned>(bytes.size()), encoding, baseURL);
@@ -87,19 +100,35 @@ DataReturner Tidier::tidy(Data* data, int encoding, URL* baseURL) {
     return Data::adopt(std::move(result.output));
 }
 
-TidyResult Tidier::repair(std::string_view bytes, int encoding, URL* /*baseURL*/) {
+TidyResult Tidier::tidyHere(std::string_view bytes, int encoding, URL* baseURL) {
     TidyResult result;
     if (!open()) return result;
-    const MarkupEncoding::Text text = MarkupEncoding::toUTF8(bytes, encoding);
-    result.code = mDoc->repair(text.bytes, text.isUTF8 ? "utf8" : "raw");
+    result.code = repair(MarkupEncoding::toUTF8(bytes, encoding), baseURL, result.output);
     if (!result.isSuccess()) {
+        result.output.clear();
         result.messages = mDoc->getMessages();
         mDoc.reset();
-        return result;
     }
-    result.output = mDoc->save();
     if (mTrim) trimEnd(result.output);
     return result;
+}
+
+int Tidier::repairHTML(const MarkupEncoding::Text& text, HTMLMending::Kind kind,
+                       std::string& output) {
+    HTMLMending mending(kind);
+    const std::string mended = mending.mend(text.bytes);
+    const int code = mDoc->repair(mended, encodingName(text));
+    if (isSuccess(code)) output = mDoc->save();
+    return code;
+}
+
+int Tidier::repairXML(const MarkupEncoding::Text& text, XMLMending::Kind kind,
+                      std::string& output) {
+    XMLMending mending(kind, text.isUTF8);
+    const std::string mended = mending.mend(text.bytes);
+    const int code = mDoc->repair(mended, encodingName(text));
+    if (isSuccess(code)) output = mending.restore(mDoc->save());
+    return code;
 }
 
 }  // namespace Orvane::FeedParser

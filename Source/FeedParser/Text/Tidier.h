@@ -1,6 +1,9 @@
 #pragma once
 
+#include "FeedParser/Text/HTMLMending.h"
+#include "FeedParser/Text/MarkupEncoding.h"
 #include "FeedParser/Text/TidyResult.h"
+#include "FeedParser/Text/XMLMending.h"
 #include "Foundation/Data.h"
 #include "Foundation/RefCounted.h"
 #include "Foundation/Returner.h"
@@ -33,14 +36,21 @@ class Tidier : public Foundation::RefCounted {
     /// for bad markup.
     Foundation::DataReturner tidy(Foundation::Data* data, int encoding, Foundation::URL* baseURL);
 
+    /// Repairs in this process, for as long as it takes, and without any log of it.
+    TidyResult tidyHere(std::string_view bytes, int encoding, Foundation::URL* baseURL);
+
     /// Makes `mDoc` with its options, if it is not there. False if it cannot be had.
     bool open();
 
  protected:
     Tidier();
 
-    /// Repairs in this process, for as long as it takes.
-    TidyResult repair(std::string_view bytes, int encoding, Foundation::URL* baseURL);
+    /// Mends `text` and has Tidy repair it; `output` is the result where that is 0 or 1. `mDoc` is
+    /// open. Gives Tidy's result.
+    virtual int repair(const MarkupEncoding::Text& text, Foundation::URL* baseURL,
+                       std::string& output) = 0;
+    int repairHTML(const MarkupEncoding::Text& text, HTMLMending::Kind kind, std::string& output);
+    int repairXML(const MarkupEncoding::Text& text, XMLMending::Kind kind, std::string& output);
 
     std::unique_ptr<TidyDocument> mDoc;  ///< made on first use, and anew after a failure
     bool mTrim = false;                  ///< strip white space from the end of the output

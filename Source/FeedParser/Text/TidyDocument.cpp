@@ -59,6 +59,7 @@ TidyDocument::TidyDocument(const _TidyDoc* document)
     : mDocument(document), mBuffers(std::make_unique<Buffers>()) {
     tidySetAppData(mDocument, this);
     tidySetReportFilter(mDocument, filterReport);
+    tidySetErrorBuffer(mDocument, mBuffers->messages.get());
 }
 
 TidyDocument::~TidyDocument() {
@@ -74,7 +75,7 @@ bool TidyDocument::countReport() {
         ++mReports;
         return true;
     }
-    if (!mIsCut) Bounds::logHit("messages of Tidy", Bounds::kTidyReports);
+    if (!mIsCut) Bounds::logHit("kTidyReports", Bounds::kTidyReports);
     mIsCut = true;
     return false;
 }

@@ -10,6 +10,10 @@ class XMLSnippetTidier : public Tidier {
     XMLSnippetTidier() { mTrim = true; }
     bool setupTidyOptions() override;
     const char* getClassName() const override { return "XMLSnippetTidier"; }
+
+ private:
+    int repair(const MarkupEncoding::Text& text, Foundation::URL* baseURL,
+               std::string& output) override;
 };
 
 }  // namespace Orvane::FeedParser

@@ -3,6 +3,8 @@
 #include "FeedParser/Text/FeedTidier.h"
 #include "FeedParser/Text/HTMLDocumentTidier.h"
 #include "FeedParser/Text/HTMLSnippetTidier.h"
+#include "FeedParser/Text/TidierAsked.h"
+#include "FeedParser/Text/TidyDocument.h"
 #include "FeedParser/Text/XMLSnippetTidier.h"
 #include "Foundation/AutoreleasePool.h"
 #include "Foundation/Logger.h"
@@ -20,21 +22,8 @@ namespace {
 constexpr int kUTF8 = 1;
 constexpr int kLatin1 = 10;
 
-/// A tidier, asked in texts.
 template <class T>
-class Tidy {
- public:
-    /// The tidied markup; "(null)" for a failure.
-    std::string operator()(const std::string& markup, int encoding = kUTF8) {
-        const AutoreleasePool pool;
-        const Ref<Data> data = Data::data(markup.data(), markup.size());
-        const Ref<Data> tidied = mTidier->tidy(data.get(), encoding, nullptr);
-        return tidied ? std::string(tidied->view()) : "(null)";
-    }
-
- private:
-    Ref<T> mTidier = Returner<T>::adopted(new T);
-};
+using Tidy = TidierAsked<T>;
 
 }  // namespace
 
@@ -91,4 +80,80 @@ TEST(Tidier, KeepsCharactersOfEveryEncoding) {
               "<b>\xC3\xA9 \xE2\x82\xAC \xC3\xA9</b>");
     EXPECT_EQ(Tidy<HTMLSnippetTidier>()("<b>\xC3\xA9 &#8364;</b>", 0),
               "<b>\xC3\xA9 \xE2\x82\xAC</b>");
+}
+
+TEST(Tidier, UsesTheBytesAsTheyAreWhereNothingTellsTheEncoding) {
+    for (const int encoding : {0, -1, 6, 99})
+        EXPECT_EQ(Tidy<HTMLDocumentTidier>()("<p>\xE9 &eacute;", encoding).find("\xE9 "),
+                  Tidy<HTMLDocumentTidier>()("<p>\xE9 &eacute;", encoding).find("<p>") + 3)
+            << encoding;
+}
+
+TEST(Tidier, TellsOfAnEmptyResultAndGivesIt) {
+    const Support::LogCapture log;
+    EXPECT_EQ(Tidy<HTMLSnippetTidier>()("<b></b>"), "");
+    EXPECT_TRUE(log.contains("Tidy returned 0 bytes of output (from 7 bytes input)!"));
+}
+
+namespace {
+
+/// Counts how often its document is set up; can refuse.
+class CountingTidier : public FeedTidier {
+ public:
+    bool setupTidyOptions() override {
+        ++setUps;
+        return !refuses && FeedTidier::setupTidyOptions();
+    }
+
+    int setUps = 0;
+    bool refuses = false;
+};
+
+}  // namespace
+
+TEST(Tidier, MakesANewDocumentAfterAFailureAlone) {
+    const Support::LoggingOn on({&Orvane::gLogParser, &gLogTidier});
+    const Support::LogCapture log;
+    Tidy<CountingTidier> tidy;
+    tidy("<rss/>");
+    tidy("<rss/>");
+    EXPECT_EQ(tidy.tidier().setUps, 1);
+    EXPECT_EQ(tidy("<html><p>x</html>"), "(null)");
+    EXPECT_TRUE(
+        log.contains("[Parser] Tidy failed, rc=2 (17 bytes, encoding=1, baseURL=(null))..."));
+    EXPECT_TRUE(log.contains("[Tidier] Tidy Errors:\n"));
+    tidy("<rss/>");
+    EXPECT_EQ(tidy.tidier().setUps, 2);
+}
+
+TEST(Tidier, FailsWhereItsOptionsAreRefused) {
+    const Support::LogCapture log;
+    Tidy<CountingTidier> tidy;
+    tidy.tidier().refuses = true;
+    EXPECT_FALSE(tidy.tidier().open());
+    EXPECT_EQ(tidy("<rss/>"), "(null)");
+    EXPECT_EQ(log.count("Tidier: setupTidyOptions failed!"), 2);
+    tidy.tidier().refuses = false;
+    EXPECT_TRUE(tidy.tidier().open());
+}
+
+TEST(TidyDocument, RefusesOptionsThatThereAreNot) {
+    const std::unique_ptr<TidyDocument> document = TidyDocument::create();
+    EXPECT_TRUE(document->set("wrap", "0"));
+    EXPECT_FALSE(document->set("no-such-option", "yes"));
+}
+
+TEST(TidyDocument, BoundsWhatTidyHasToSay) {
+    const Support::LoggingOn on({&Orvane::gLogParser});
+    const Support::LogCapture log;
+    const std::unique_ptr<TidyDocument> document = TidyDocument::create();
+    std::string many;
+    for (int i = 0; i < 5000; ++i)
+        many += "<b></i>";
+    document->repair(many, "utf8");
+    EXPECT_TRUE(document->hasCutMessages());
+    EXPECT_LT(document->getMessages().size(), 20000u);
+    EXPECT_EQ(log.count("A document has reached the bound \"kTidyReports\", 100"), 1);
+    document->repair("<b></i>", "utf8");
+    EXPECT_FALSE(document->hasCutMessages());
 }
