@@ -39,6 +39,7 @@ class Table;
 /// Used on the thread that opened it, which runs the run loop; debug builds check that.
 class Database : Foundation::Uncopyable {
  public:
+    using TableChangeDict = SQLite::TableChangeDict;
     static constexpr const Foundation::NotificationName& kDatabaseClosingNotification =
         Foundation::NotificationNames::kDatabaseClosing;
     static constexpr const Foundation::NotificationName& kDatabaseFatalErrorNotification =
