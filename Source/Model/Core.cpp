@@ -44,6 +44,11 @@ Core* Core::_getRow(SQLite::Table* table, SQLite::RowID rowID) {
     return static_cast<Core*>(row);
 }
 
+void Core::giveUpNewRow(Core* row) {
+    // Nothing of what deleting a stored row takes along belongs to it yet.
+    if (row && row->getTable() && row->getRowID() == 0) row->Row::deleteRow();
+}
+
 OVObject* Core::getOVObject(Core* core) {
     if (!core) return nullptr;
     if (!core->mOVObject) {

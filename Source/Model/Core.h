@@ -29,6 +29,11 @@ class Core : public SQLite::ListedRow {
     /// `OVInvalidRowIDError` if there is none of that ID, `AssertionFailure` for an ID below 1.
     static Core* _getRow(SQLite::Table* table, SQLite::RowID rowID);
 
+    /// Takes a new row out of its table, behind a failure of what was to save it: it would be saved
+    /// with whatever is saved next, and could make all of that fail. Does nothing for null and for
+    /// a row that is in the file.
+    static void giveUpNewRow(Core* row);
+
     /// The public object of a row, made on first use; null for null. Throws `AssertionFailure` if
     /// it cannot be made. The result is not the caller's own.
     static OVObject* getOVObject(Core* core);

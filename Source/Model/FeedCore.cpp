@@ -75,7 +75,12 @@ Returner<FeedCore> FeedCore::createFeed(Foundation::URL* url, bool persist) {
     if (persist) {
         feed->getIdentifier();
         feed->addToTable(TableOf<FeedCore>::instance());
-        feed->saveChanges();
+        try {
+            feed->saveChanges();
+        } catch (...) {
+            giveUpNewRow(feed);
+            throw;
+        }
     }
     return feed;
 }

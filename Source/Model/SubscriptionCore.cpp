@@ -1,16 +1,30 @@
 #include "Model/SubscriptionCore.h"
 
+#include "Foundation/ArrayOf.h"
 #include "Foundation/AssertionFailure.h"
 #include "Foundation/Logger.h"
 #include "Foundation/NotificationCenter.h"
 #include "Model/ClientCore.h"
 #include "Model/EntryCore.h"
 #include "Model/FeedCore.h"
+#include "Model/MinistryOfTruth.h"
 #include "Model/PublicObjects.h"
+#include "SQLite/Database.h"
+#include "SQLite/Transaction.h"
 
 namespace Orvane {
 
+using Foundation::ArrayOf;
+using Foundation::gLog;
+using Foundation::IsEqual;
+using Foundation::MutableArrayOf;
+using Foundation::Ref;
+using Foundation::Returner;
 using SQLite::column;
+using SQLite::Cursor;
+using SQLite::gDatabase;
+using SQLite::Query;
+using SQLite::TableOf;
 
 const char SubscriptionCore::kSchema[] =
     "rowID integer not null unique primary key, "
@@ -45,47 +59,39 @@ ClientCore* SubscriptionCore::getClient() const {
     return mClient.getValue();
 }
 
+void SubscriptionCore::setClient(ClientCore* client) {
+    const Ref<ClientCore> old = mClient.getValue();
+    if (IsEqual(old.get(), client)) return;
+    mClient.setValue(client);
+    if (old.get()) old->removeFromSubscriptions(this);
+    if (client) client->addToSubscriptions(this);
+}
+
 FeedCore* SubscriptionCore::getFeed() const {
     return mFeed.getValue();
 }
 
 void SubscriptionCore::setFeed(FeedCore* feed) {
-    const Foundation::Ref<FeedCore> old = mFeed.getValue();
-    if (Foundation::IsEqual(old.get(), feed)) return;
+    const Ref<FeedCore> old = mFeed.getValue();
+    if (IsEqual(old.get(), feed)) return;
     mFeed.setValue(feed);
     if (old.get()) old->removeFromSubscriptions(this);
     if (feed) feed->addToSubscriptions(this);
 }
 
-double SubscriptionCore::getCurrentRefreshInterval() const {
-    const ClientCore* client = getTable() ? getClient() : nullptr;
-    if (!client) return FeedCore::kRefreshNever;
-    if (!mRefreshesInBackground && !client->isProcessRunning()) return FeedCore::kRefreshNever;
-    if (client->isDormant()) return FeedCore::kRefreshNever;
-    double interval = mRefreshInterval;
-    if (interval == 0) {
-        const Foundation::Ref<SubscriptionCore> settings = client->_getSubscription(0);
-        interval = settings.get() ? settings->mRefreshInterval.getValue() : 0;
-    }
-    if (interval == 0) return kDefaultRefreshInterval;
-    return interval > 0 ? interval : FeedCore::kRefreshNever;
-}
-
 int SubscriptionCore::getEntryCount(bool all) const {
-    static auto* const sAll =
-        new SQLite::Query(getTable()->getDatabase(),
-                          "select count(*) from Entries where feed=? and localDateCreated>?");
-    static auto* const sUnread = new SQLite::Query(
-        getTable()->getDatabase(),
-        "select count(*) from Entries where feed=? and localDateCreated>? and read=0");
     OV_ASSERT_AS(!isClientSettings(), "!this->isClientSettings()");
-    OV_ASSERT_MESSAGE_AS(!SQLite::TableOf<EntryCore>::instance()->isChanged(),
+    OV_ASSERT_MESSAGE_AS(!TableOf<EntryCore>::instance()->isChanged(),
                          "!TableOf<EntryCore>::instance()->isChanged()",
                          "getEntryCount called with unsaved entries");
-    SQLite::Query& query = all ? *sAll : *sUnread;
+    static auto* const sAll =
+        new Query(gDatabase, "select count(*) from Entries where feed=? and localDateCreated>?");
+    static auto* const sUnread = new Query(
+        gDatabase, "select count(*) from Entries where feed=? and localDateCreated>? and read=0");
+    Query& query = all ? *sAll : *sUnread;
     query.bindRowID(1, mFeed.getRowID());
     query.bind(2, mExpirationDate.getValue());
-    const int count = SQLite::Cursor(query).intColumn(0);
+    const int count = Cursor(query).intColumn(0);
     gLogFeed.log("%@ computed %s count = %u", this, all ? "entry" : "unread", count);
     return count;
 }
@@ -100,6 +106,68 @@ bool SubscriptionCore::updateUnreadCount() {
     Foundation::NotificationCenter::getLocal()->post(kUnreadCountChangedNotification, this,
                                                      nullptr);
     return true;
+}
+
+void SubscriptionCore::notifyRefreshScheduleChanged() const {
+    // The object of a notification is there to be known by.
+    Foundation::NotificationCenter::getLocal()->post(kRefreshScheduleChangedNotification,
+                                                     const_cast<SubscriptionCore*>(this), nullptr);
+}
+
+bool SubscriptionCore::startRefresh() {
+    FeedCore* feed = getFeed();
+    return feed && feed->startRefresh();
+}
+
+Returner<ArrayOf<FeedCore>> SubscriptionCore::getSubscribedFeeds() {
+    static auto* const sQuery =
+        new Query(gDatabase,
+                  "select feed from Subscriptions where refreshInterval>=0 and feed>0"
+                  " group by feed");
+    Ref<MutableArrayOf<FeedCore>> feeds = MutableArrayOf<FeedCore>::array();
+    for (Cursor cursor(*sQuery); cursor.hasRow(); cursor.nextRow()) {
+        Ref<FeedCore> feed;
+        if (cursor.getObject(0, feed)) feeds->add(feed);
+    }
+    return Returner<MutableArrayOf<FeedCore>>(std::move(feeds));
+}
+
+void SubscriptionCore::saveChanges() {
+    const Ref<SubscriptionCore> self = this;
+    CoreOf::saveChanges();
+    // Owners that are not in memory have no new subscriptions.
+    ClientCore* client = TableOf<ClientCore>::instance()->cachedRowWithID(mClient.getRowID());
+    if (client) client->mSubscriptions.removeSaved(this);
+    FeedCore* feed = TableOf<FeedCore>::instance()->cachedRowWithID(mFeed.getRowID());
+    if (feed) feed->mSubscriptions.removeSaved(this);
+}
+
+void SubscriptionCore::deleteRow() {
+    gLog.log("Deleting %@", this);
+    const Ref<FeedCore> feed = getFeed();
+    if (!feed.get() || getRowID() == 0) {
+        forgetOwners();
+        return CoreOf::deleteRow();
+    }
+    const SQLite::Transaction transaction(true);
+    Query query(getTable()->getDatabase(), "select count(*) from Subscriptions where feed=?");
+    query.bind(1, feed.get());
+    const int n = Cursor(query).intColumn(0);
+    OV_ASSERT_AS(n > 0, "n>0");
+    CoreOf::deleteRow();
+    MinistryOfTruth::instance()->saveSubscriptionsSoon();
+    if (n == 1) feed->deleteRow();
+}
+
+/// One that was never saved must not be saved by what it belonged to.
+void SubscriptionCore::forgetOwners() {
+    const Ref<SubscriptionCore> self = getRefCount() > 0 ? this : nullptr;
+    if (ClientCore* client = getClient()) client->mSubscriptions.remove(this);
+    if (FeedCore* feed = getFeed()) feed->mSubscriptions.remove(this);
+}
+
+void SubscriptionCore::ipcDidChangeColumn(int) {
+    MinistryOfTruth::instance()->saveSubscriptionsSoon();
 }
 
 OVObject* SubscriptionCore::createOVObject() {

@@ -26,11 +26,12 @@ Returner<ArrayOf<String>> SubscriptionCore::deserializeEnclosureTypes(const Stri
     if (!types) return nullptr;
     Ref<MutableArrayOf<String>> list = MutableArrayOf<String>::array();
     std::string_view rest = types->view();
-    for (std::size_t tab; (tab = rest.find('\t')) != std::string_view::npos;) {
+    // The text of an empty list is empty.
+    while (!rest.empty()) {
+        const std::size_t tab = rest.find('\t');
         list->add(String::string(std::string(rest.substr(0, tab))));
-        rest.remove_prefix(tab + 1);
+        rest.remove_prefix(tab == std::string_view::npos ? rest.size() : tab + 1);
     }
-    list->add(String::string(std::string(rest)));
     return Returner<MutableArrayOf<String>>(std::move(list));
 }
 

@@ -60,8 +60,7 @@ TEST_F(FeedCoreRefresh, TakesTheClientsIntervalForASubscriptionWithoutOne) {
     ClientCore* client = storedClient("a");
     subscribe(client, feed, 0);
     EXPECT_EQ(feed->getRefreshInterval(), 1800);
-    SubscriptionCore* settings = subscribe(client, nullptr, 900);
-    EXPECT_TRUE(settings->isClientSettings());
+    client->getDefaultSubscription()->mRefreshInterval.setValue(900);
     EXPECT_EQ(feed->getRefreshInterval(), 900);
 }
 

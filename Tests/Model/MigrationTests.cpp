@@ -4,8 +4,8 @@
 #include "Model/ClientCore.h"
 #include "Model/EnclosureCore.h"
 #include "Model/EntryCore.h"
+#include "Model/FakeHousekeeping.h"
 #include "Model/FeedCore.h"
-#include "Model/Housekeeping.h"
 #include "Model/OldSchema.h"
 #include "Model/StorageTest.h"
 #include "Model/SubscriptionCore.h"
@@ -25,15 +25,6 @@ using Strings = std::vector<std::string>;
 namespace {
 
 constexpr int kFull = 13;  // SQLITE_FULL
-
-class FakeHousekeeping : public Housekeeping {
- public:
-    FakeHousekeeping() { setCurrent(this); }
-    ~FakeHousekeeping() override { setCurrent(nullptr); }
-    void updateAllUnreadCountsSoon() override { ++recounts; }
-
-    int recounts = 0;
-};
 
 /// A database of an old version, which is open.
 class MigrationTest : public StorageTest {

@@ -36,6 +36,8 @@ TEST_F(SubscriptionEnclosuresTest, JoinsTypesByTabs) {
     EXPECT_EQ(textOf(back->at(1)), "video/*");
     const Ref<ArrayOf<String>> none = SubscriptionCore::deserializeEnclosureTypes(nullptr);
     EXPECT_EQ(none.get(), nullptr);
+    const Ref<ArrayOf<String>> empty = SubscriptionCore::deserializeEnclosureTypes(str(""));
+    EXPECT_TRUE(empty->isEmpty());
 }
 
 TEST_F(SubscriptionEnclosuresTest, NoTypesAreAllTypes) {
