@@ -56,6 +56,36 @@ URLReturner withSuffix(const URL& url, const char* suffix) {
     return URL::urlWithFileSystemPath(path.c_str(), false);
 }
 
+/// Whether a database of that version can be used, perhaps once it has been migrated.
+bool canUse(int version, int major, int minor) {
+    if (major != Schema::kMajorVersion) {
+        gWarn.log(
+            "Database is too old (v%i on disk) vs. (v%i in framework): have to delete & recreate "
+            "database",
+            version, Schema::kVersion);
+        return false;
+    }
+    if (minor < Migrations::kOldestMinorVersion) {
+        gWarn.log("No migration path from Orvane database v%i to v%i.", version, Schema::kVersion);
+        return false;
+    }
+    if (minor > Schema::kMinorVersion) {
+        gWarn.log(
+            "Database on disk (v%i) is newer than what I know (v%i), but I think I can still use "
+            "it.",
+            version, Schema::kVersion);
+    }
+    return true;
+}
+
+void migrate(int minor) {
+    const double start = Clock::current().now();
+    Migrations::run(minor);
+    gLog.log("Migrating database schema from %d.%d to %d.%d took %.3f seconds.",
+             Schema::kMajorVersion, minor, Schema::kMajorVersion, Schema::kMinorVersion,
+             Clock::current().now() - start);
+}
+
 /// True while it lives.
 class Flag : Uncopyable {
  public:
@@ -164,30 +194,8 @@ bool MinistryOfTruth::checkDatabaseSchema() {
         gDatabase->setUserVersion(version);
     }
     gLogAgentVerbose.log("Database userVersion=%i; that's %i/%i", version, major, minor);
-    if (major != Schema::kMajorVersion) {
-        gWarn.log(
-            "Database is too old (v%i on disk) vs. (v%i in framework): have to delete & recreate "
-            "database",
-            version, Schema::kVersion);
-        return false;
-    }
-    if (minor < Migrations::kOldestMinorVersion) {
-        gWarn.log("No migration path from Orvane database v%i to v%i.", version, Schema::kVersion);
-        return false;
-    }
-    if (minor > Schema::kMinorVersion) {
-        gWarn.log(
-            "Database on disk (v%i) is newer than what I know (v%i), but I think I can still use "
-            "it.",
-            version, Schema::kVersion);
-        return true;
-    }
-    if (minor == Schema::kMinorVersion) return true;
-    const double start = Clock::current().now();
-    Migrations::run(minor);
-    gLog.log("Migrating database schema from %d.%d to %d.%d took %.3f seconds.",
-             Schema::kMajorVersion, minor, Schema::kMajorVersion, Schema::kMinorVersion,
-             Clock::current().now() - start);
+    if (!canUse(version, major, minor)) return false;
+    if (minor < Schema::kMinorVersion) migrate(minor);
     return true;
 }
 

@@ -10,6 +10,7 @@
 
 #include "Foundation/Switches.h"
 #include "Foundation/URL.h"
+#include "Model/LineFeeding.h"
 #include "Model/MinistryOfTruth.h"
 #include "SQLite/Database.h"
 #include "SQLite/FakeCenter.h"
@@ -68,6 +69,7 @@ int main(int argc, char** argv) {
     if (argc != 3) return 2;
     const AutoreleasePool pool;
     FakeCenter noBus;
+    LineFeeding feeding;
     // What it says is looked at only where it ends by itself.
     std::optional<Support::LogCapture> quiet;
     if (!GetBoolEnv("OVAgentQuitAfterRecovery")) quiet.emplace();
