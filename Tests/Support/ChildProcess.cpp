@@ -6,6 +6,7 @@
 #include <fcntl.h>
 #include <pty.h>
 #include <spawn.h>
+#include <sys/resource.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -57,12 +58,19 @@ pid_t spawn(const std::vector<std::string>& command, int out, int err) {
     return pid;
 }
 
-int waitFor(pid_t pid) {
+double secondsOf(const timeval& time) {
+    return static_cast<double>(time.tv_sec) + static_cast<double>(time.tv_usec) * 1e-6;
+}
+
+void waitFor(ChildResult& child) {
     int status = 0;
-    while (waitpid(pid, &status, 0) < 0) {
-        if (errno != EINTR) check(errno, "waitpid");
+    rusage usage = {};
+    while (wait4(child.pid, &status, 0, &usage) < 0) {
+        if (errno != EINTR) check(errno, "wait4");
     }
-    return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
+    child.status = WIFEXITED(status) ? WEXITSTATUS(status) : -1;
+    child.processorSeconds = secondsOf(usage.ru_utime) + secondsOf(usage.ru_stime);
+    child.peakBytes = static_cast<std::size_t>(usage.ru_maxrss) * 1024;
 }
 
 }  // namespace
@@ -84,7 +92,7 @@ ChildResult runChild(const std::vector<std::string>& command, ChildStderr kind) 
     ChildResult result;
     result.pid = spawn(command, out.get(), err.get());
     err.close();
-    result.status = waitFor(result.pid);
+    waitFor(result);
     result.out = dir.readFile("out");
     result.err = terminal ? readTerminal(terminal.get()) : dir.readFile("err");
     return result;

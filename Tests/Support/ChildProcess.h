@@ -1,5 +1,6 @@
 #pragma once
 
+#include <cstddef>
 #include <string>
 #include <vector>
 
@@ -11,6 +12,8 @@ struct ChildResult {
     int pid = 0;
     std::string out;
     std::string err;
+    double processorSeconds = 0;  ///< its own, and of its children that it has waited for
+    std::size_t peakBytes = 0;    ///< of memory that it had at once; at least what the test had
 };
 
 /// What a program finds as its standard error.

@@ -1,0 +1,99 @@
+#pragma once
+
+#include <Orvane/OVBase.h>
+
+#include <chrono>
+#include <optional>
+#include <string>
+#include <string_view>
+#include <vector>
+
+/// What a document of bytes from anywhere turned out to be: a feed, a single entry, a web page with
+/// its links, a person, or nothing. A plain value, to look at: nothing of it reaches the database.
+///
+/// Texts are UTF-8. A text, a time or a part that the document has not got is empty.
+struct OVDocument {
+    using Text = std::optional<std::string>;
+    using Time = std::optional<std::chrono::sys_seconds>;
+
+    enum class Kind { Unknown, Page, Feed, Entry, Friend };
+    /// The family of a feed's or an entry's vocabulary.
+    enum class Format { Unknown = 0, RSS = 1, Atom = 2 };
+    /// How the contents of entries are wanted.
+    enum class Contents {
+        AsStored,  ///< as the document has them, its own escapes undone
+        Tidied,    ///< as they are shown: repaired, and safe; none where that fails
+    };
+    /// What a link leads to.
+    enum class LinkKind {
+        Nothing = 0,
+        RSSFeed = 1,
+        AtomFeed = 2,
+        AtomService = 3,
+        FOAFDocument = 4,
+        RSDDocument = 5,
+        Self = 6,
+        AlternatePage = 7,
+    };
+
+    struct Author {
+        Text name, email, url;
+    };
+    struct Content {
+        std::string data;       ///< a text, unless `isBinary`
+        Text type;              ///< a media type
+        bool isBinary = false;  ///< the bytes may be anything
+    };
+    struct Enclosure {
+        Text url, mimeType, title;
+        long long length = 0;  ///< in bytes, as the document says; 0 if it says nothing
+    };
+    struct Entry {
+        Text id, title, rights, alternateURL, baseURL;
+        std::optional<Author> author;
+        std::optional<Content> content, summary;
+        Time dateCreated, datePublished, dateUpdated;
+        std::vector<Enclosure> enclosures;
+        Text xmlHash;  ///< the SHA-1 of the entry's own XML
+    };
+    struct Link {
+        Text rel, type, title;
+        Text href;  ///< as it is written
+        Text url;   ///< absolute; empty for what is no fit target of a click
+        LinkKind kind = LinkKind::Nothing;
+    };
+    struct Feed {
+        Text title, subtitle, id, rights, alternateURL, iconURL, logoURL, url;
+        Time dateUpdated;
+    };
+    struct Page {
+        Text base;
+        std::vector<Link> links;  ///< in the order of the page
+    };
+    struct Friend {
+        Text name, firstName, familyName, nick, url;
+        std::vector<Friend> knows;
+    };
+
+    /// Reads a document. `url`, which may be empty, is the document's own: relative URLs in it
+    /// count from there. Throws `OVException` for a `url` that is not absolute; never for bad
+    /// bytes.
+    ///
+    /// The thread that runs the library's run loop, one document at a time.
+    OV_EXPORT static OVDocument read(std::string_view bytes, const std::string& url = {},
+                                     Contents contents = Contents::AsStored);
+
+    Kind kind = Kind::Unknown;
+    Format format = Format::Unknown;
+    int attempts = 0;  ///< that were made at reading it: from 1 to 4
+    Text tidiedWith;   ///< the class of the tidier that repaired it; empty if it was read as it is
+    // The one of these that `kind` names.
+    std::optional<Feed> feed;
+    std::optional<Page> page;
+    std::optional<Friend> person;
+    std::vector<Entry> entries;  ///< of the feed, in the document's order, or the single one
+    std::vector<Link> links;     ///< that stand outside of entries, of whatever kind
+    // What entries got that name nobody, and no time.
+    std::vector<Author> defaultAuthors, defaultContributors;
+    Time defaultTimePublished;
+};
