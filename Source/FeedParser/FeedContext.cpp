@@ -93,19 +93,19 @@ bool FeedContext::takeURL(Context* child) {
 }
 
 bool FeedContext::takeDate(Context* child) {
-    const auto* date = static_cast<DateContext*>(child);
+    const auto dateOf = [](Context* context) { return static_cast<DateContext*>(context); };
     switch (child->tag) {
         case UpdatedTag:
         case ModifiedTag:
         case LastBuildDateTag:
-            feed->mDateUpdated.setValue(date->date.get());
-            feed->mTimeZoneUpdated.setValue(date->timeZone.get());
+            feed->mDateUpdated.setValue(dateOf(child)->date.get());
+            feed->mTimeZoneUpdated.setValue(dateOf(child)->timeZone.get());
             return true;
         case PubDateTag:
         case PublishedTag:
             // That is no column of the feed, but what its entries have unless they say otherwise.
-            info->defaultTimePublished = date->date;
-            info->defaultTimeZonePublished = date->timeZone;
+            info->defaultTimePublished = dateOf(child)->date;
+            info->defaultTimeZonePublished = dateOf(child)->timeZone;
             return true;
         default:
             return false;
