@@ -21,6 +21,9 @@ build() {
     cmake --build --preset release
 }
 
+export ORVANE_PROGRAMS="$top/build/release/libexec/orvane"
+export ORVANE_RESOURCES="$top/build/release/share/orvane"
+
 if [ "$what" = bench ]; then
     build ON
     for program in build/release/Benchmarks/*_benchmark; do
@@ -33,8 +36,6 @@ fi
 
 # What is built is of no interest to who wants to use it, unless it fails.
 build OFF >&2
-export ORVANE_PROGRAMS="$top/build/release/libexec/orvane"
-export ORVANE_RESOURCES="$top/build/release/share/orvane"
 if [ "$what" = samples ]; then
     build/release/bin/orvane inspect Resources/samples/news.xml Resources/samples/broken.rss
 else

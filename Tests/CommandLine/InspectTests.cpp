@@ -1,4 +1,5 @@
 #include "CommandLine/Program.h"
+#include "Support/EnvVar.h"
 #include "Support/TempDir.h"
 
 #include <gmock/gmock.h>
@@ -210,6 +211,15 @@ TEST_F(Inspect, TellsHowADocumentWasRepaired) {
     EXPECT_EQ(found["attempts"], 2);
     EXPECT_EQ(found["tidiedWith"], "FeedTidier");
     EXPECT_EQ(found["entries"][0]["title"], "U");
+}
+
+TEST_F(Inspect, FindsTheTidierInItsOwnTree) {
+    const Support::EnvVar programs("ORVANE_PROGRAMS", nullptr);
+    // Too long to be repaired in the process.
+    const json found = inspect("<rss><channel><title>T</title><description>" +
+                               std::string(100000, 'x') + "</description><item>");
+    EXPECT_EQ(found["attempts"], 2);
+    EXPECT_EQ(found["kind"], "feed");
 }
 
 TEST_F(Inspect, TellsOfASingleEntry) {

@@ -8,12 +8,14 @@
 #include <poll.h>
 #include <sys/socket.h>
 #include <sys/wait.h>
+#include <unistd.h>
 
 #include <algorithm>
 #include <cerrno>
 #include <csignal>
 #include <cstdlib>
 #include <cstring>
+#include <filesystem>
 #include <utility>
 
 extern char** environ;
@@ -46,6 +48,15 @@ void relay(std::string_view log) {
     }
 }
 
+/// Where the helper is in a tree that was not installed, or was moved since: as far from the
+/// program that runs as it would be there.
+std::string pathBesideProgram() {
+    std::error_code error;
+    const auto program = std::filesystem::read_symlink("/proc/self/exe", error);
+    const auto top = program.parent_path().parent_path();
+    return (top / "libexec" / "orvane").string() + kProgram;
+}
+
 }  // namespace
 
 TidyHelper& TidyHelper::getShared() {
@@ -62,7 +73,11 @@ TidyHelper::~TidyHelper() {
 
 std::string TidyHelper::getPath() {
     const char* set = std::getenv("ORVANE_PROGRAMS");
-    return std::string(set && *set ? set : ORVANE_INSTALLED_PROGRAMS) + kProgram;
+    if (set && *set) return std::string(set) + kProgram;
+    const std::string installed = std::string(ORVANE_INSTALLED_PROGRAMS) + kProgram;
+    if (access(installed.c_str(), X_OK) == 0) return installed;
+    const std::string beside = pathBesideProgram();
+    return access(beside.c_str(), X_OK) == 0 ? beside : installed;
 }
 
 bool TidyHelper::start() {

@@ -42,7 +42,8 @@ class TidyHelper : Foundation::Uncopyable {
     /// The program's process; -1 if it does not run.
     pid_t getPID() const { return mPID; }
 
-    /// Where the program is: in `$ORVANE_PROGRAMS` or else where the library's own are installed.
+    /// Where the program is: in `$ORVANE_PROGRAMS`, or else where the library's own are installed,
+    /// or else in the tree of the program that runs, which may be one that was just built.
     static std::string getPath();
 
  private:
