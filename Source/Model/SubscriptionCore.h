@@ -97,7 +97,8 @@ class SubscriptionCore : public CoreOf<SubscriptionCore> {
     void setSettingsActual(double refreshInterval, double expirationInterval,
                            bool refreshesInBackground, bool downloadsEnclosures,
                            double maxEnclosureSize, String* enclosureTypes);
-    /// The settings of a new row. REQUIRES: a client, and its settings row, or none of a feed.
+    /// The settings of a new row. Throws `AssertionFailure` for one with a feed and without a
+    /// client.
     void setDefaultSettings();
 
     // Refreshing.

@@ -1,4 +1,5 @@
 #include "Foundation/ArrayOf.h"
+#include "Foundation/AssertionFailure.h"
 #include "Foundation/Date.h"
 #include "Foundation/GregorianDate.h"
 #include "Foundation/Logger.h"
@@ -98,7 +99,9 @@ void SubscriptionCore::setDefaultSettings() {
         mRefreshesInBackground.setValue(kDefaultBackground);
         mDownloadsEnclosures.setValue(kDefaultAutoDownload);
     } else {
-        const SubscriptionCore* settings = getClient()->getDefaultSubscription();
+        ClientCore* client = getClient();
+        OV_ASSERT_AS(client != nullptr, "client");
+        const SubscriptionCore* settings = client->getDefaultSubscription();
         mExpirationInterval.setValue(0);
         mRefreshInterval.setValue(0);
         mMaxEnclosureSize.setValue(0);
@@ -127,6 +130,8 @@ bool SubscriptionCore::bumpExpirationDate(Date* date) {
     if (!(interval > 0)) return false;
     const Ref<Date> start = date ? Ref<Date>(date) : today();
     const Ref<Date> expiration = start->addTime(-interval);
+    // The start of the count stands for no date.
+    if (!expiration.get()) return false;
     const Date* present = mExpirationDate;
     if (present && present->compare(*expiration) >= 0) return false;
     mExpirationDate.setValue(expiration);

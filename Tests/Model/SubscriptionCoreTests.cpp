@@ -8,6 +8,8 @@
 #include "Support/AssertionOf.h"
 #include "Support/DefaultZone.h"
 
+#include <algorithm>
+
 using namespace Foundation;
 using namespace Orvane;
 using Support::assertionOf;
@@ -312,6 +314,16 @@ TEST_F(SubscriptionCoreTest, NeverExpiresByANegativeInterval) {
     EXPECT_EQ(mine->mExpirationDate.getValue(), nullptr);
     settings->mExpirationInterval.setValue(0);
     EXPECT_FALSE(mine->bumpExpirationDate(nullptr));
+    // Back to what stands for no date.
+    mine->mExpirationInterval.setValue(clock.kStart);
+    mine->mExpirationDate.setValue(date(-1));
+    EXPECT_FALSE(mine->bumpExpirationDate(nullptr));
+}
+
+TEST_F(SubscriptionCoreTest, TakesItsDefaultsFromAClient) {
+    auto* free = row<SubscriptionCore>();
+    free->setFeed(freeFeed("http://example.org/new"));
+    EXPECT_EQ(assertionOf([&] { free->setDefaultSettings(); }), "client");
 }
 
 TEST_F(SubscriptionCoreTest, CountsTheEntriesThatHaveNotExpired) {
@@ -329,6 +341,22 @@ TEST_F(SubscriptionCoreTest, CountsTheEntriesThatHaveNotExpired) {
     EXPECT_EQ(log.count(" computed unread count = 1"), 1);
     mine->mExpirationDate.setValue(nullptr);
     EXPECT_EQ(mine->getEntryCount(true), 3);
+}
+
+TEST_F(SubscriptionCoreTest, CountsUnreadEntriesByTheirIndexAlone) {
+    reopen(true);
+    const LoggingOn on{{&SQLite::gLogSQL}};
+    log.clear();
+    (void)SubscriptionCore::getRow(2)->getEntryCount(false);
+    const auto line = std::find_if(log.lines().begin(), log.lines().end(), [](const auto& text) {
+        return text.find("\"select count(*) from Entries") != std::string::npos;
+    });
+    ASSERT_NE(line, log.lines().end());
+    const std::size_t start = line->find("select"), end = line->find("\" -->");
+    const SQLite::Cursor plan(&db(), "explain query plan %s", line->substr(start, end - start));
+    EXPECT_STREQ(plan.cStringColumn(3),
+                 "SEARCH Entries USING COVERING INDEX Entries_unreadcount "
+                 "(feed=? AND read=? AND localDateCreated>?)");
 }
 
 TEST_F(SubscriptionCoreTest, CountsNothingForSettingsOrWhileEntriesWaitToBeSaved) {
