@@ -3,6 +3,7 @@
 #include "FeedParser/Text/FeedURLUtilsCore.h"
 #include "Foundation/AssertionFailure.h"
 #include "Foundation/Data.h"
+#include "Foundation/Guard.h"
 #include "Foundation/Logger.h"
 #include "Foundation/URL.h"
 #include "Model/AgentLink.h"
@@ -28,14 +29,22 @@ using SQLite::TableOf;
 using SQLite::Transaction;
 
 FeedCore::~FeedCore() {
-    // What has an ID is pointed at by that.
-    if (getRowID() != 0) return;
-    // Who still holds one of the new rows must not find this behind it.
-    for (const Ref<SQLite::Row>& row : mEntries.getNewRows()) {
-        static_cast<EntryCore&>(*row).mFeed.setValue(nullptr);
+    Foundation::callGuarded("virtual Orvane::FeedCore::~FeedCore()", [this] { letGo(); });
+}
+
+void FeedCore::letGo() {
+    if (mFeeder.get()) {
+        // It has nobody to tell any more.
+        setReceivers(*mFeeder, nullptr);
+        mFeeder->removed();
     }
-    for (const Ref<SQLite::Row>& row : mSubscriptions.getNewRows()) {
-        static_cast<SubscriptionCore&>(*row).mFeed.setValue(nullptr);
+    // Who still holds one of the new rows must not find this behind it.
+    FeedCore* const row = getRowID() != 0 ? this : nullptr;
+    for (const Ref<SQLite::Row>& entry : mEntries.getNewRows()) {
+        static_cast<EntryCore&>(*entry).mFeed.setValue(row);
+    }
+    for (const Ref<SQLite::Row>& subscription : mSubscriptions.getNewRows()) {
+        static_cast<SubscriptionCore&>(*subscription).mFeed.setValue(row);
     }
 }
 
@@ -87,7 +96,10 @@ Returner<FeedCore> FeedCore::createFeed(Foundation::URL* url, bool persist) {
 
 Returner<FeedCore> FeedCore::createFeed(Foundation::Data* data, Foundation::URL* url) {
     DocumentParser* parser = DocumentParser::current();
-    return parser ? parser->parseFeed(data, url) : nullptr;
+    Ref<FeedCore> feed = parser ? parser->parseFeed(data, url) : nullptr;
+    // What is identified by its URL must have one.
+    if (feed.get() && !feed->mURL.getValue()) feed->mURL.setValue(url);
+    return feed;
 }
 
 String* FeedCore::getIdentifier() const {

@@ -133,8 +133,11 @@ class FeedCore : public FeedColumns {
     OVObject* createOVObject() override;
 
  private:
+    static void setReceivers(FeedRefresher& feeder, FeedCore* feed);
+    void letGo();
     void askForOldEntries();
     bool recoverEntry(Foundation::URL* url, Foundation::Data* data);
+    void takeRecovered(EntryCore& entry, Foundation::URL* file);
     bool adoptRecovered(EntryCore* entry, Foundation::String* identifier);
     void refreshFromFile(Foundation::URL* file);
     void refreshStarted(FeedRefresher* feeder);

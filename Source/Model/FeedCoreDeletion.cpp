@@ -60,7 +60,9 @@ void FeedCore::deleteRow() {
     // Entries that are not saved yet would bring the feed back with them.
     const SQLite::BasicRowIterator::NewRows newEntries = mEntries.getNewRows();
     for (const Ref<SQLite::Row>& row : newEntries) {
-        row->deleteRow();
+        auto* entry = static_cast<EntryCore*>(row.get());
+        removeFromEntries(entry);
+        entry->deleteRow();
     }
     if (getRowID() != 0) deleteEntryRows(*this);
     const double start = Clock::current().now();

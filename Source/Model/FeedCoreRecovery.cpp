@@ -119,28 +119,32 @@ bool FeedCore::recoverEntry(Foundation::URL* url, Data* data) {
     parsed->mCurrent.setValue(false);
     gLogSub.log("    Recovered archived entry '%@' from <%@>", parsed->mTitle.getValue(), url);
     const Ref<String> identifier = identifierOf(url);
-    Ref<EntryCore> entry = EntryCore::getEntryWithIdentifier(identifier);
-    if (entry.get()) {
-        if (!entry->mFeed) entry->setFeed(this);
-        entry->updateFrom(parsed, true);
-    } else {
-        entry = parsed;
-        if (!adoptRecovered(entry, identifier)) return false;
-    }
+    const Ref<EntryCore> known = EntryCore::getEntryWithIdentifier(identifier);
+    const Ref<EntryCore> entry = known.get() ? known : parsed;
     try {
-        entry->setRead(true);
-        const Ref<Date> created = FileUtils::getFileCreationDate(url);
-        if (created.get()) {
-            entry->mLocalDateCreated.setValue(created);
-            entry->mLocalDateUpdated.setValue(created);
+        if (!known.get()) {
+            if (!adoptRecovered(entry, identifier)) return false;
+        } else {
+            if (!known->mFeed) known->setFeed(this);
+            known->updateFrom(parsed, true);
         }
-        entry->saveChanges();
+        takeRecovered(*entry, url);
     } catch (...) {
         // What could not be saved now must not come in the way of all that is saved later.
         EntryUndo::giveUp(entry);
         throw;
     }
     return true;
+}
+
+void FeedCore::takeRecovered(EntryCore& entry, Foundation::URL* file) {
+    entry.setRead(true);
+    const Ref<Date> created = FileUtils::getFileCreationDate(file);
+    if (created.get()) {
+        entry.mLocalDateCreated.setValue(created);
+        entry.mLocalDateUpdated.setValue(created);
+    }
+    entry.saveChanges();
 }
 
 bool FeedCore::adoptRecovered(EntryCore* entry, String* identifier) {

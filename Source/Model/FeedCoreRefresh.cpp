@@ -59,15 +59,22 @@ Foundation::DateReturner FeedCore::getNextRefreshDate() const {
     return last ? last->addTime(interval) : Date::now();
 }
 
+void FeedCore::setReceivers(FeedRefresher& feeder, FeedCore* feed) {
+    const auto set = [&](ActionOf<FeedRefresher>& action,
+                         void (FeedCore::*method)(FeedRefresher*)) {
+        action.setReceiver(feed ? receiver<FeedRefresher>(feed, method) : nullptr);
+    };
+    set(feeder.mRefreshStarted, &FeedCore::refreshStarted);
+    set(feeder.mFetchStarted, &FeedCore::fetchStarted);
+    set(feeder.mRefreshFinished, &FeedCore::refreshFinished);
+}
+
 FeedRefresher* FeedCore::getFeeder() {
     if (mFeeder.get()) return mFeeder.get();
     FeederFactory* factory = FeederFactory::current();
     if (!factory) return nullptr;
     mFeeder = factory->makeFeeder(this);
-    mFeeder->mRefreshStarted.setReceiver(receiver<FeedRefresher>(this, &FeedCore::refreshStarted));
-    mFeeder->mFetchStarted.setReceiver(receiver<FeedRefresher>(this, &FeedCore::fetchStarted));
-    mFeeder->mRefreshFinished.setReceiver(
-        receiver<FeedRefresher>(this, &FeedCore::refreshFinished));
+    setReceivers(*mFeeder, this);
     return mFeeder.get();
 }
 
@@ -76,9 +83,7 @@ void FeedCore::removeFeeder() {
     const Ref<FeedRefresher> feeder = mFeeder;
     feeder->removed();
     // Others may hold it, and it has nothing to tell any more.
-    feeder->mRefreshStarted.setReceiver(nullptr);
-    feeder->mFetchStarted.setReceiver(nullptr);
-    feeder->mRefreshFinished.setReceiver(nullptr);
+    setReceivers(*feeder, nullptr);
     mFeeder = nullptr;
 }
 

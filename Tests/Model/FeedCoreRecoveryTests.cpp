@@ -208,6 +208,22 @@ TEST_F(FeedCoreRecovery, GivesUpAnEntryThatCannotBeSaved) {
     EXPECT_EQ(count("Entries"), 1);
 }
 
+TEST_F(FeedCoreRecovery, LeavesAStoredEntryAsItWasIfItCannotBeSaved) {
+    EntryCore* known = row<EntryCore>();
+    known->mID.setValue(string("a"));
+    known->mTitle.setValue(string("Old"));
+    feed->addToEntries(known);
+    known->getIdentifier();
+    known->saveChanges();
+    db().execute(
+        "create trigger Refuse before update on Entries begin select raise(abort, 'refused'); end");
+    EXPECT_FALSE(feed->addEntryFromFile(archive("a", "New"), data("entry a New")));
+    db().execute("drop trigger Refuse");
+    db().saveRows();
+    EXPECT_EQ(text(known->mTitle), "Old");
+    EXPECT_FALSE(known->mRead);
+}
+
 TEST_F(FeedCoreRecovery, WaitsForAParser) {
     DocumentParser::setCurrent(nullptr);
     archive("a");

@@ -129,6 +129,15 @@ TEST_F(FeedCoreRefresh, StopsAndDropsItsFeeder) {
     EXPECT_EQ(feeders.made, 2);
 }
 
+TEST_F(FeedCoreRefresh, EndsItsFeederWithIt) {
+    {
+        const AutoreleasePool inner;
+        freeFeed()->getFeeder();
+    }
+    EXPECT_EQ(feeders.feeder->calls, "removed ");
+    feeders.feeder->mRefreshFinished.invoke(feeders.feeder.get());
+}
+
 TEST_F(FeedCoreRefresh, AnnouncesWhatItsFeederDoes) {
     FeedCore* feed = storedFeed();
     feed->getFeeder();

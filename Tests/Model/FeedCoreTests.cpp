@@ -117,6 +117,22 @@ TEST_F(FeedCoreTest, LeavesNoLinkToItselfBehind) {
     EXPECT_EQ(subscription->getFeed(), nullptr);
 }
 
+TEST_F(FeedCoreTest, LeavesItsIDBehindOnceItHasOne) {
+    EntryCore* entry = row<EntryCore>();
+    {
+        const AutoreleasePool inner;
+        FeedCore* feed = freeFeed();
+        feed->addToEntries(entry);
+        TableOf<FeedCore>::instance()->uncacheRows();
+        feed->addToTable(TableOf<FeedCore>::instance());
+        feed->SQLite::Row::saveChanges();
+        TableOf<FeedCore>::instance()->uncacheRows();
+    }
+    EXPECT_EQ(entry->mFeed.getRowID(), 1);
+    ASSERT_NE(entry->getFeed(), nullptr);
+    EXPECT_EQ(entry->getFeed()->getRowID(), 1);
+}
+
 TEST_F(FeedCoreTest, GivesTheEntriesOfTheFileThatMeetACondition) {
     FeedCore* feed = storedFeed();
     insertEntry(feed, "a", 100, false);
@@ -229,6 +245,7 @@ TEST_F(FeedCoreTest, IsMadeOfADocument) {
     const FakeParser parser;
     FeedCore* feed = FeedCore::createFeed(data("feed News"), url("http://example.org/feed"));
     EXPECT_EQ(text(feed->mTitle.getValue()), "News");
+    EXPECT_EQ(text(feed->getIdentifier()), kIdentifier);
     EXPECT_EQ(parser.lastURL, "http://example.org/feed");
     feed = FeedCore::createFeed(data("entry 1 Post"), nullptr);
     EXPECT_EQ(feed, nullptr);

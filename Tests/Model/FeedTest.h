@@ -96,7 +96,6 @@ class FakeParser : public Orvane::DocumentParser {
         std::istringstream words = open(data, url);
         if (kind != "feed") return nullptr;
         Foundation::Ref<Orvane::FeedCore> feed = make<Orvane::FeedCore>();
-        feed->mURL.setValue(url);
         feed->mTitle.setValue(word(words));
         return feed;
     }
