@@ -54,7 +54,7 @@ DifferenceEngine::DifferenceEngine(Ref<FeedCore> feed, bool force)
 
 DifferenceEngine::~DifferenceEngine() = default;
 
-bool DifferenceEngine::updateFrom(Ref<FeedCore> newFeed) {
+bool DifferenceEngine::updateFrom(const Ref<FeedCore>& newFeed) {
     gLogSub.log("DifferenceEngine updating feed %@", newFeed->mURL.getValue());
     const FeedCore::ReadState before = mFeed->getReadState();
     bool changed = false;

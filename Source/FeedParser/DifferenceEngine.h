@@ -34,7 +34,7 @@ class DifferenceEngine : Foundation::Uncopyable {
     /// Throws what saving throws, and what `FeedCore::updateFrom` throws. A stored feed's entries
     /// are then as they were, and so is how far it has been read, so that the same document can be
     /// merged again; only files of entries that were to be archived may stay.
-    bool updateFrom(Foundation::Ref<FeedCore> newFeed);
+    bool updateFrom(const Foundation::Ref<FeedCore>& newFeed);
 
     std::uint32_t getUpdatedCount() const { return mUpdated; }
     std::uint32_t getAddedCount() const { return mAdded; }

@@ -69,7 +69,7 @@ TEST_F(DifferenceEngineTest, LoadsNoEntryThatHasNotChanged) {
     parsed->mTitle.setValue(string("Renamed"));
     log.clear();
     EXPECT_EQ(merge(parsed), "same 0 0 0");
-    EXPECT_EQ(log.count("Instantiated row Entries"), 0);
+    EXPECT_EQ(log.count("Instantiated row "), 0);
     EXPECT_EQ(log.count("Comparing entry"), 0);
     EXPECT_EQ(Date::getAbsoluteTime(feed->mLocalDateUpdated), before);
     EXPECT_EQ(count("Feeds where title='News'"), 1);

@@ -1,49 +1,19 @@
 #pragma once
 
 #include "FeedParser/DifferenceEngine.h"
-#include "Foundation/Number.h"
+#include "FeedParser/Documents.h"
 #include "Model/ContentCore.h"
 #include "Model/EnclosureCore.h"
 #include "Model/FeedTest.h"
 
-#include <memory>
 #include <string>
 #include <vector>
-
-/// One post of a document.
-struct Post {
-    std::string guid;
-    std::string title = "Title";
-    std::string more{};  ///< what else is in its source
-    bool hasSource = true;
-    double published = 5000;
-    long long length = 0;  ///< of its enclosure; none for 0
-};
 
 /// A test that merges one document after the other into a stored feed.
 class MergeTest : public FeedTest {
  protected:
-    static std::string sourceOf(const Post& post) {
-        return "<item><guid>" + post.guid + "</guid><title>" + post.title + "</title>" + post.more +
-               (post.length ? std::to_string(post.length) : "") + "</item>";
-    }
-    /// A parsed feed of these posts, the newest first, as the parser makes it.
     static Orvane::FeedCore* document(const std::vector<Post>& posts) {
-        Orvane::FeedCore* parsed = freeFeed();
-        parsed->mTitle.setValue(string("News"));
-        double created = Foundation::Clock::current().now();
-        for (const Post& post : posts) {
-            Orvane::EntryCore* entry = row<Orvane::EntryCore>();
-            entry->mID.setValue(string(post.guid));
-            entry->mTitle.setValue(string(post.title));
-            entry->mCurrent.setValue(true);
-            entry->mDatePublished.setValue(date(post.published));
-            entry->mLocalDateCreated.setValue(date(created -= 0.01));
-            if (post.hasSource) setSource(*entry, sourceOf(post));
-            if (post.length != 0) addEnclosure(*entry, post.length);
-            parsed->addToEntries(entry);
-        }
-        return parsed;
+        return makeDocument(kAddress, posts);
     }
     /// Merges a document. "changed 1 2 3" are the counts of updated, added and archived entries;
     /// "same" stands for a result of false.
@@ -93,18 +63,4 @@ class MergeTest : public FeedTest {
 
     Orvane::FeedCore* const feed = storedFeed();
     Orvane::SubscriptionCore* const subscription = subscribe(storedClient("client"), feed);
-
- private:
-    static void setSource(Orvane::EntryCore& entry, const std::string& source) {
-        auto* content = row<Orvane::ContentCore>();
-        content->mData.setValue(data(source));
-        content->mMIMEType.setValue(string("application/rss+xml"));
-        entry.setXMLRepresentation(content);
-    }
-    static void addEnclosure(Orvane::EntryCore& entry, long long length) {
-        auto* enclosure = row<Orvane::EnclosureCore>();
-        enclosure->mURL.setValue(url("http://example.org/file.mp3"));
-        enclosure->mLength.setValue(length);
-        entry.addToEnclosures(enclosure);
-    }
 };
