@@ -7,6 +7,7 @@ namespace Orvane::FeedParser {
 /// Repairs a feed that is no well-formed XML. Gives null for a page.
 class FeedTidier : public Tidier {
  public:
+    FeedTidier() { mReadsXML = true; }
     bool setupTidyOptions() override;
     const char* getClassName() const override { return "FeedTidier"; }
 

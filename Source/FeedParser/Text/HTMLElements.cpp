@@ -144,12 +144,12 @@ constexpr HTMLElement kElements[] = {
     {"tbody", E::Known | E::ImpliedEnd | E::Shown},
     {"td", E::Known | E::ImpliedEnd | E::Shown},
     {"template", E::Known | E::Left},
-    {"textarea", E::Known | E::RawText},
+    {"textarea", E::Known},
     {"tfoot", E::Known | E::ImpliedEnd | E::Shown},
     {"th", E::Known | E::ImpliedEnd | E::Shown},
     {"thead", E::Known | E::ImpliedEnd | E::Shown},
     {"time", E::Known | E::Inline | E::Shown},
-    {"title", E::Known | E::RawText | E::Left},
+    {"title", E::Known | E::Left},
     {"tr", E::Known | E::ImpliedEnd | E::Shown},
     {"track", E::Known | E::Empty | E::Shown},
     {"tt", E::Known | E::Inline | E::Shown},
@@ -158,7 +158,7 @@ constexpr HTMLElement kElements[] = {
     {"var", E::Known | E::Inline | E::Shown},
     {"video", E::Known | E::Shown},
     {"wbr", E::Known | E::Empty | E::Shown},
-    {"xmp", E::Known | E::RawText},
+    {"xmp", E::Known},
 };
 
 }  // namespace

@@ -7,6 +7,9 @@ namespace Orvane::FeedParser {
 
 /// Finds out in what encoding markup stands.
 struct MarkupEncoding {
+    /// libxml2's number of ISO-8859-1, which has a character for each byte.
+    static constexpr int kLatin1 = 10;
+
     /// Markup, in UTF-8 or as it came.
     struct Text {
         std::string bytes;

@@ -81,9 +81,8 @@ DataReturner Tidier::tidy(Data* data, int encoding, URL* baseURL) {
     if (hasNothingToRepair(bytes)) return DataReturner::retained(data);
 
     TidyResult result =
-        MarkupLook::isSmallAndShallow(bytes)
-            ? tidyHere(bytes, encoding, baseURL)
-            : TidyHelper::getShared().tidy(getClassName(), bytes, encoding, baseURL);
+        mayTidyHere(bytes) ? tidyHere(bytes, encoding, baseURL)
+                           : TidyHelper::getShared().tidy(getClassName(), bytes, encoding, baseURL);
     if (!result.isSuccess()) {
         gLogParser.log("Tidy failed, rc=%i (%u bytes, encoding=%i, baseURL=%@)...", result.code,
                        static_cast<unsigned>(bytes.size()), encoding, baseURL);
@@ -98,6 +97,10 @@ DataReturner Tidier::tidy(Data* data, int encoding, URL* baseURL) {
                               static_cast<unsigned>(bytes.size()));
     }
     return Data::adopt(std::move(result.output));
+}
+
+bool Tidier::mayTidyHere(std::string_view markup) const {
+    return MarkupLook::isSmallAndShallow(markup) && (mReadsXML || MarkupLook::isPlainHTML(markup));
 }
 
 TidyResult Tidier::tidyHere(std::string_view bytes, int encoding, URL* baseURL) {

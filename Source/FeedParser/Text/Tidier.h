@@ -36,8 +36,12 @@ class Tidier : public Foundation::RefCounted {
     /// for bad markup.
     Foundation::DataReturner tidy(Foundation::Data* data, int encoding, Foundation::URL* baseURL);
 
-    /// Repairs in this process, for as long as it takes, and without any log of it.
+    /// Repairs in this process, for as long as it takes, which may be for ever: see `mayTidyHere`.
+    /// Logs nothing but bounds.
     TidyResult tidyHere(std::string_view bytes, int encoding, Foundation::URL* baseURL);
+
+    /// Whether a cheap look finds that repairing the markup can't take much.
+    bool mayTidyHere(std::string_view markup) const;
 
     /// Makes `mDoc` with its options, if it is not there. False if it cannot be had.
     bool open();
@@ -54,6 +58,7 @@ class Tidier : public Foundation::RefCounted {
 
     std::unique_ptr<TidyDocument> mDoc;  ///< made on first use, and anew after a failure
     bool mTrim = false;                  ///< strip white space from the end of the output
+    bool mReadsXML = false;              ///< takes markup for XML
 };
 
 }  // namespace Orvane::FeedParser

@@ -308,12 +308,14 @@ void XMLMending::usePrefixOf(std::string_view name, bool isElement) {
 }
 
 void XMLMending::closeImplied(std::string_view name) {
+    // The root is ended by its own end alone.
+    if (mOpen.size() < 2) return;
     const std::string lower = XMLCharacters::toLower(name);
-    if (isOneOf(kEndedByNext, lower) && !mOpen.empty() &&
-        XMLCharacters::toLower(mOpen.back().name) == lower) {
-        closeTop();
-    }
-    if (mKind == Kind::Feed && isOneOf(kEntries, lower)) handleEnd(name);
+    const std::string top = XMLCharacters::toLower(mOpen.back().name);
+    if (top == lower && isOneOf(kEndedByNext, lower)) closeTop();
+    if (mKind != Kind::Feed || !isOneOf(kEntries, lower)) return;
+    const bool isRoot = XMLCharacters::toLower(mOpen.front().name) == lower;
+    if (mOpenCounts[lower] > (isRoot ? 1 : 0)) handleEnd(name);
 }
 
 void XMLMending::handleStart(const MarkupToken& token) {

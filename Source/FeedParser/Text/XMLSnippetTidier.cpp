@@ -12,6 +12,10 @@ bool XMLSnippetTidier::setupTidyOptions() {
 
 int XMLSnippetTidier::repair(const MarkupEncoding::Text& text, Foundation::URL* baseURL,
                              std::string& output) {
+    if (!text.isUTF8) {
+        // Nobody can tell what is safe in bytes of no known encoding.
+        return repair(MarkupEncoding::toUTF8(text.bytes, MarkupEncoding::kLatin1), baseURL, output);
+    }
     const int code = repairXML(text, XMLMending::Kind::Snippet, output);
     output = SafeMarkup::make(output, baseURL);
     return code;

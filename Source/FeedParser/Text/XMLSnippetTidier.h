@@ -7,7 +7,10 @@ namespace Orvane::FeedParser {
 /// Makes XHTML, safe to show, of the XML content of an entry.
 class XMLSnippetTidier : public Tidier {
  public:
-    XMLSnippetTidier() { mTrim = true; }
+    XMLSnippetTidier() {
+        mTrim = true;
+        mReadsXML = true;
+    }
     bool setupTidyOptions() override;
     const char* getClassName() const override { return "XMLSnippetTidier"; }
 

@@ -92,7 +92,8 @@ TEST(HTMLMending, BoundsTheAttributes) {
 TEST(HTMLMending, GivesThePagesOfTodayTheirLinks) {
     const std::string page = TidierAsked<HTMLDocumentTidier>()(
         "<html><head><link rel=alternate href=/a><x-head></x-head><link rel=icon href=/b>"
-        "<search><link rel=alternate href=/c>");
+        "<search><link rel=alternate href=/c><title>d <link rel=next href=/e>");
+    EXPECT_NE(page.find("<link rel=\"next\" href=\"/e\" />"), std::string::npos) << page;
     EXPECT_NE(page.find("<link rel=\"alternate\" href=\"/a\" />"), std::string::npos);
     EXPECT_NE(page.find("<link rel=\"icon\" href=\"/b\" />"), std::string::npos);
     EXPECT_NE(page.find("<link rel=\"alternate\" href=\"/c\" />"), std::string::npos);

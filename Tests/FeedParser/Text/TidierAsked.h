@@ -14,8 +14,18 @@ class TidierAsked {
 
     explicit TidierAsked(std::string base = {}) : mBase(std::move(base)) {}
 
-    /// The tidied markup; "(null)" for a failure.
+    /// What tidying in this process gives; "(null)" for a failure.
     std::string operator()(const std::string& markup, int encoding = kUTF8) {
+        const Foundation::AutoreleasePool pool;
+        const Foundation::Ref<Foundation::URL> base =
+            Foundation::URL::url(Foundation::String::string(mBase));
+        const Orvane::FeedParser::TidyResult result =
+            mTidier->tidyHere(markup, encoding, base.get());
+        return result.isSuccess() ? result.output : "(null)";
+    }
+
+    /// What tidying gives, wherever that is done.
+    std::string tidy(const std::string& markup, int encoding = kUTF8) {
         const Foundation::AutoreleasePool pool;
         const Foundation::Ref<Foundation::Data> data =
             Foundation::Data::data(markup.data(), markup.size());

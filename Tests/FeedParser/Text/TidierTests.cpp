@@ -56,12 +56,12 @@ TEST(Tidier, LogsWhatItDoes) {
     const Support::LogCapture log;
     const Ref<HTMLSnippetTidier> tidier =
         Returner<HTMLSnippetTidier>::adopted(new HTMLSnippetTidier);
-    const Ref<Data> data = Data::data("<b>x", 4);
+    const Ref<Data> data = Data::data("<b>x</b>", 8);
     const Ref<URL> base = URL::url(String::string("http://a/b"));
     const Ref<Data> tidied = tidier->tidy(data.get(), kUTF8, base.get());
     EXPECT_TRUE(log.contains(
-        "Tidying 4 bytes (class=HTMLSnippetTidier, encoding=1, baseURL=http://a/b)..."));
-    EXPECT_TRUE(log.contains("Tidier input:\n<b>x"));
+        "Tidying 8 bytes (class=HTMLSnippetTidier, encoding=1, baseURL=http://a/b)..."));
+    EXPECT_TRUE(log.contains("Tidier input:\n<b>x</b>"));
     EXPECT_TRUE(log.contains("Tidier output:\n<b>x</b>"));
     EXPECT_TRUE(log.contains("...tidied into 8 bytes"));
 }
@@ -91,7 +91,7 @@ TEST(Tidier, UsesTheBytesAsTheyAreWhereNothingTellsTheEncoding) {
 
 TEST(Tidier, TellsOfAnEmptyResultAndGivesIt) {
     const Support::LogCapture log;
-    EXPECT_EQ(Tidy<HTMLSnippetTidier>()("<b></b>"), "");
+    EXPECT_EQ(Tidy<HTMLSnippetTidier>().tidy("<b></b>"), "");
     EXPECT_TRUE(log.contains("Tidy returned 0 bytes of output (from 7 bytes input)!"));
 }
 
@@ -115,14 +115,14 @@ TEST(Tidier, MakesANewDocumentAfterAFailureAlone) {
     const Support::LoggingOn on({&Orvane::gLogParser, &gLogTidier});
     const Support::LogCapture log;
     Tidy<CountingTidier> tidy;
-    tidy("<rss/>");
-    tidy("<rss/>");
+    tidy.tidy("<rss/>");
+    tidy.tidy("<rss/>");
     EXPECT_EQ(tidy.tidier().setUps, 1);
-    EXPECT_EQ(tidy("<html><p>x</html>"), "(null)");
+    EXPECT_EQ(tidy.tidy("<html><p>x</html>"), "(null)");
     EXPECT_TRUE(
         log.contains("[Parser] Tidy failed, rc=2 (17 bytes, encoding=1, baseURL=(null))..."));
     EXPECT_TRUE(log.contains("[Tidier] Tidy Errors:\n"));
-    tidy("<rss/>");
+    tidy.tidy("<rss/>");
     EXPECT_EQ(tidy.tidier().setUps, 2);
 }
 
@@ -131,7 +131,7 @@ TEST(Tidier, FailsWhereItsOptionsAreRefused) {
     Tidy<CountingTidier> tidy;
     tidy.tidier().refuses = true;
     EXPECT_FALSE(tidy.tidier().open());
-    EXPECT_EQ(tidy("<rss/>"), "(null)");
+    EXPECT_EQ(tidy.tidy("<rss/>"), "(null)");
     EXPECT_EQ(log.count("Tidier: setupTidyOptions failed!"), 2);
     tidy.tidier().refuses = false;
     EXPECT_TRUE(tidy.tidier().open());
@@ -156,4 +156,21 @@ TEST(TidyDocument, BoundsWhatTidyHasToSay) {
     EXPECT_EQ(log.count("A document has reached the bound \"kTidyReports\", 100"), 1);
     document->repair("<b></i>", "utf8");
     EXPECT_FALSE(document->hasCutMessages());
+}
+
+TEST(Tidier, ReadsContentOfNoKnownEncodingAsWindows) {
+    EXPECT_EQ(Tidy<HTMLSnippetTidier>()("<b>\xE9\x80</b>", 0), "<b>\xC3\xA9\xE2\x82\xAC</b>");
+    EXPECT_EQ(Tidy<XMLSnippetTidier>()("<b>\xE9\x80</b>", 0), "<b>\xC3\xA9\xE2\x82\xAC</b>");
+}
+
+TEST(Tidier, WorksInTheProcessOnlyOnWhatCantTakeMuch) {
+    const Ref<Tidier> html = Returner<Tidier>::adopted(new HTMLSnippetTidier);
+    const Ref<Tidier> xml = Returner<Tidier>::adopted(new XMLSnippetTidier);
+    const Ref<Tidier> feed = Returner<Tidier>::adopted(new FeedTidier);
+    EXPECT_TRUE(html->mayTidyHere("<p>x"));
+    EXPECT_FALSE(html->mayTidyHere("<table>"));
+    EXPECT_TRUE(xml->mayTidyHere("<table>"));
+    EXPECT_TRUE(feed->mayTidyHere("<rss>"));
+    for (const Ref<Tidier>& tidier : {html, xml, feed})
+        EXPECT_FALSE(tidier->mayTidyHere("<p>" + std::string(20000, 'x')));
 }

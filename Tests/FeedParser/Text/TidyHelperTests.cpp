@@ -137,9 +137,9 @@ TEST(TidyHelper, GetsWhatIsNotSmall) {
     for (int i = 0; i < 2000; ++i)
         markup += "<b>xxxxxx</b> <br>";
     TidierAsked<HTMLSnippetTidier> tidier;
-    EXPECT_EQ(tidier("<b>x"), "<b>x</b>");
+    EXPECT_EQ(tidier.tidy("<b>x</b>"), "<b>x</b>");
     EXPECT_EQ(TidyHelper::getShared().getPID(), -1);
-    const std::string tidied = tidier(markup);
+    const std::string tidied = tidier.tidy(markup);
     EXPECT_GT(TidyHelper::getShared().getPID(), 0);
     const Ref<HTMLSnippetTidier> here = Returner<HTMLSnippetTidier>::adopted(new HTMLSnippetTidier);
     EXPECT_EQ(tidied, here->tidyHere(markup, 1, nullptr).output);

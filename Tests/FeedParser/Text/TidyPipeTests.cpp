@@ -149,6 +149,20 @@ TEST(MarkupLook, SeesWhatIsSmallAndShallow) {
     EXPECT_FALSE(MarkupLook::isSmallAndShallow(std::string("<\0a\0", 4)));
 }
 
+TEST(MarkupLook, TellsPlainHTML) {
+    for (const char* plain : {"", "a < b", "<p>a<p>b", "<P>a <b>b <i>c</i></B></p><br><img src=x/>",
+                              "<ul><li>a<p>b</li></ul><div><blockquote>c</blockquote></div>",
+                              "<dl><dt>a</dt></dl>", "a<!-- b -->c"}) {
+        EXPECT_TRUE(MarkupLook::isPlainHTML(plain)) << plain;
+    }
+    for (const char* other :
+         {"<table>", "<b>a", "a</b>", "<b><i>a</b></i>", "<b><p>a</p></b>", "<p/>", "<x-y>a</x-y>",
+          "<li>a</li>", "<ul><b>a</b></ul>", "<a><b><a>b</a></b></a>", "<script></script>",
+          "<?a?>b", "<![CDATA[a]]>", "<ul><li>a<li>b</ul>", "<svg/>", "<h1><p>a</p></h1>"}) {
+        EXPECT_FALSE(MarkupLook::isPlainHTML(other)) << other;
+    }
+}
+
 TEST(MarkupLook, TellsPagesByTheirFirstElement) {
     EXPECT_TRUE(MarkupLook::isPage("<?xml?><!DOCTYPE x>a<HTML>"));
     EXPECT_TRUE(MarkupLook::isPage("<x:body>"));

@@ -88,6 +88,8 @@ const Case kCases[] = {
      "<rss><d>a<br />b<img src=\"x\" />c<p>d</p><p>e<li>f</li></p></d></rss>\n"},
     {"AnItemThatWasNotEnded", "<rss><item><b>x<item>y</item></rss>",
      "<rss><item><b>x</b></item><item>y</item></rss>\n"},
+    {"AnEntryThatIsTheRoot", "<entry><a>x<entry>y</entry>",
+     "<entry><a>x<entry>y</entry></a></entry>\n"},
     {"CharactersThatMarkLines", "<rss>\xEF\xA3\xBE\n\xEF\xA3\xBD</rss>",
      "<rss>\xEF\xA3\xBE\n\xEF\xA3\xBD</rss>\n"},
 };
