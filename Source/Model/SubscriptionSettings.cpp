@@ -120,7 +120,8 @@ double SubscriptionCore::getCurrentRefreshInterval() const {
     double interval = mRefreshInterval;
     if (interval == 0) interval = client->getDefaultSubscription()->mRefreshInterval;
     if (interval == 0) return kDefaultRefreshInterval;
-    return interval > 0 ? interval : FeedCore::kRefreshNever;
+    if (interval < 0) return FeedCore::kRefreshNever;
+    return interval;
 }
 
 bool SubscriptionCore::bumpExpirationDate(Date* date) {
