@@ -108,10 +108,19 @@ bool isUnreadable(const xmlNode* node) {
            xmlStrcasecmp(node->name, reinterpret_cast<const xmlChar*>("xml")) == 0;
 }
 
-void removeUnreadableAttributes(xmlNode* element) {
+bool isName(const xmlChar* name) {
+    return xmlValidateName(name, 0) == 0;
+}
+
+/// Gives an element a name that XML has, and leaves it only attributes of such names.
+void mendNames(xmlNode* element) {
+    if (!isName(element->name)) {
+        const std::string name = "_" + std::string(xmlView(element->name));
+        xmlNodeSetName(element, xmlChars(isName(xmlChars(name)) ? name : "_"));
+    }
     for (xmlAttr* attribute = element->properties; attribute;) {
         xmlAttr* next = attribute->next;
-        if (xmlValidateName(attribute->name, 0) != 0) xmlRemoveProp(attribute);
+        if (!isName(attribute->name)) xmlRemoveProp(attribute);
         attribute = next;
     }
 }
@@ -121,7 +130,7 @@ void removeUnreadableAttributes(xmlNode* element) {
 void removeUnreadable(xmlNode* root) {
     for (xmlNode* node = root; node;) {
         xmlNode* next = nextNode(node, root);
-        if (node->type == XML_ELEMENT_NODE) removeUnreadableAttributes(node);
+        if (node->type == XML_ELEMENT_NODE) mendNames(node);
         if (isUnreadable(node)) {
             xmlUnlinkNode(node);
             xmlFreeNode(node);
@@ -142,28 +151,45 @@ void putIntoXHTML(xmlNode* root) {
     }
 }
 
-Ref<XMLTree> readHTML(std::string_view page, std::string& error) {
-    const std::string bytes = isWideXML(page) ? std::string(page) : allowedInXML(page);
-    Faults faults;
-    const Context context(htmlNewParserCtxt(), htmlFreeParserCtxt);
-    prepare(context.get(), faults);
-    constexpr int kOptions =
-        HTML_PARSE_RECOVER | HTML_PARSE_NONET | HTML_PARSE_NOERROR | HTML_PARSE_NOWARNING;
-    const char* encoding = UTF8::isValid(bytes) ? "UTF-8" : nullptr;
-    const Ref<XMLTree> html = treeOf(htmlCtxtReadMemory(
-        context.get(), bytes.data(), static_cast<int>(bytes.size()), nullptr, encoding, kOptions));
-    if (!html) {
-        error = faults.first.empty() ? "No root element" : faults.first;
-        return nullptr;
-    }
-    // A document of XML, so that it is written as such.
+/// The tree of XHTML that libxml2's tree of HTML stands for: of XML, so that it is written as such.
+Ref<XMLTree> makeXHTML(const XMLTree& html) {
     const Ref<XMLTree> tree = XMLTree::empty();
-    xmlNode* root = xmlDocCopyNode(html->root(), tree->document(), 1);
+    xmlNode* root = xmlDocCopyNode(html.root(), tree->document(), 1);
     if (!root) throw std::bad_alloc();
     tree->setRoot(root);
     putIntoXHTML(root);
     removeUnreadable(root);
     return tree;
+}
+
+/// Reads HTML in an encoding, which libxml2 looks for in the page if it is null.
+Ref<XMLTree> parseHTML(const std::string& page, const char* encoding, std::string& error) {
+    Faults faults;
+    const Context context(htmlNewParserCtxt(), htmlFreeParserCtxt);
+    prepare(context.get(), faults);
+    constexpr int kOptions =
+        HTML_PARSE_RECOVER | HTML_PARSE_NONET | HTML_PARSE_NOERROR | HTML_PARSE_NOWARNING;
+    const Ref<XMLTree> html = treeOf(htmlCtxtReadMemory(
+        context.get(), page.data(), static_cast<int>(page.size()), nullptr, encoding, kOptions));
+    if (html) return makeXHTML(*html);
+    error = faults.first.empty() ? "No root element" : faults.first;
+    return nullptr;
+}
+
+/// Whether all that a tree holds is UTF-8.
+bool isUTF8(const XMLTree& tree) {
+    const std::unique_ptr<xmlBuffer, void (*)(xmlBuffer*)> text(xmlBufferCreate(), xmlBufferFree);
+    if (!text) throw std::bad_alloc();
+    xmlNodeDump(text.get(), tree.document(), tree.root(), 0, 0);
+    return UTF8::isValid(xmlView(xmlBufferContent(text.get())));
+}
+
+Ref<XMLTree> readHTML(std::string_view bytes, std::string& error) {
+    const std::string page = isWideXML(bytes) ? std::string(bytes) : allowedInXML(bytes);
+    if (UTF8::isValid(page)) return parseHTML(page, "UTF-8", error);
+    // Where libxml2 finds no encoding that fits, it leaves halves of characters in the tree.
+    const Ref<XMLTree> tree = parseHTML(page, nullptr, error);
+    return tree && isUTF8(*tree) ? tree : parseHTML(mendUTF8(allowedInXML(page)), "UTF-8", error);
 }
 
 bool isPage(const XMLTree& tree) {

@@ -48,7 +48,20 @@ bool hasOtherEncoding(std::string_view bytes) {
     return xmlStrcasecmp(xmlChars(encoding), reinterpret_cast<const xmlChar*>("utf-8")) != 0;
 }
 
-/// UTF-8, without zeros, in which each byte that is none is read as Latin-1, what most of them are.
+/// How long the CDATA section or comment at the start of a text is; 0 if there is none.
+std::size_t opaqueLength(std::string_view text) {
+    const std::pair<std::string_view, std::string_view> kinds[] = {{"<![CDATA[", "]]>"},
+                                                                   {"<!--", "-->"}};
+    for (const auto& [start, end] : kinds) {
+        if (!text.starts_with(start)) continue;
+        const std::size_t found = text.find(end, start.size());
+        return found == std::string_view::npos ? text.size() : found + end.size();
+    }
+    return 0;
+}
+
+}  // namespace
+
 std::string mendUTF8(std::string_view bytes) {
     std::string mended;
     while (!bytes.empty()) {
@@ -64,20 +77,6 @@ std::string mendUTF8(std::string_view bytes) {
     }
     return mended;
 }
-
-/// How long the CDATA section or comment at the start of a text is; 0 if there is none.
-std::size_t opaqueLength(std::string_view text) {
-    const std::pair<std::string_view, std::string_view> kinds[] = {{"<![CDATA[", "]]>"},
-                                                                   {"<!--", "-->"}};
-    for (const auto& [start, end] : kinds) {
-        if (!text.starts_with(start)) continue;
-        const std::size_t found = text.find(end, start.size());
-        return found == std::string_view::npos ? text.size() : found + end.size();
-    }
-    return 0;
-}
-
-}  // namespace
 
 bool isWideXML(std::string_view bytes) {
     using namespace std::string_view_literals;

@@ -14,6 +14,9 @@ std::string mendXML(std::string_view bytes);
 /// document defines entities, names are left to it.
 std::string mendReferences(std::string_view bytes);
 
+/// UTF-8, without zeros, in which each byte that is none is read as Latin-1, what most of them are.
+std::string mendUTF8(std::string_view bytes);
+
 /// Whether a document is in UTF-16 or UTF-32, by its first two bytes.
 bool isWideXML(std::string_view bytes);
 

@@ -1,5 +1,6 @@
 #include "Utilities/XMLDocumentReader.h"
 
+#include "Foundation/UTF8.h"
 #include "Support/LogCapture.h"
 #include "Support/TempDir.h"
 #include "Utilities/XMLTexts.h"
@@ -69,6 +70,14 @@ TEST(XMLDocumentReader, ReadsHTMLAsUTF8WhereItIs) {
     EXPECT_NE(read("<p>caf\xE9</p>", XMLTolerance::HTML).find("caf\xC3\xA9"), std::string::npos);
 }
 
+TEST(XMLDocumentReader, ReadsHTMLInTheEncodingThatItNames) {
+    EXPECT_NE(read("<meta charset='iso-8859-5'><p>\xD0</p>", XMLTolerance::HTML).find("\xD0\xB0"),
+              std::string::npos);
+    // Where it names none, libxml2 by itself leaves half a character in the tree.
+    const std::string page = read("<?xm.0\"?><!\"?><!rn><?\xEF]", XMLTolerance::HTML);
+    EXPECT_TRUE(UTF8::isValid(page)) << page;
+}
+
 TEST(XMLDocumentReader, WritesTheNamespaceOfAPageOnce) {
     const std::string page =
         "<html xmlns='http://www.w3.org/1999/xhtml'><body><p xmlns='x'>a<br></body></html>";
@@ -92,6 +101,9 @@ TEST(XMLDocumentReader, LeavesNothingThatCouldNotBeReadAgain) {
     EXPECT_EQ(read("<a><?xml version='1.0'?><b></a>", XMLTolerance::XML), "<a><b/></a>");
     EXPECT_EQ(read("<p>x<!-- a -- b --><!--c--->y<!--z--></p>", XMLTolerance::HTML),
               "<html xmlns=\"http://www.w3.org/1999/xhtml\"><body><p>xy<!--z--></p></body></html>");
+    EXPECT_EQ(
+        read("<div><p:8>x</p:8></div>", XMLTolerance::HTML),
+        "<html xmlns=\"http://www.w3.org/1999/xhtml\"><body><div><_8>x</_8></div></body></html>");
     EXPECT_EQ(read("<p .x='1' y='2'>\x02</p>", XMLTolerance::HTML),
               "<html xmlns=\"http://www.w3.org/1999/xhtml\"><body><p y=\"2\"/></body></html>");
 }
