@@ -7,7 +7,9 @@
 #include "Foundation/Dictionary.h"
 #include "Foundation/Logger.h"
 #include "Foundation/Number.h"
+#include "Model/AuthorCore.h"
 #include "Model/ClientsPlist.h"
+#include "Model/ContentCore.h"
 #include "Model/EnclosureCore.h"
 #include "Model/EntryCore.h"
 #include "Model/FeedCore.h"
@@ -110,22 +112,29 @@ void moveDownloadsAway() {
     }
 }
 
+/// Lets go of what is in memory of entries and what belongs to them, of which nothing may be left
+/// to save. The open transaction keeps every row that it has saved: tables that knew them all would
+/// look through ever more of them at each save.
+void forgetRows() {
+    gDatabase->saveRows();
+    TableOf<EntryCore>::instance()->uncacheRows();
+    TableOf<EnclosureCore>::instance()->uncacheRows();
+    TableOf<AuthorCore>::instance()->uncacheRows();
+    TableOf<ContentCore>::instance()->uncacheRows();
+}
+
 void restoreEntriesOf(FeedCore& feed) {
-    const AutoreleasePool pool;
     const double start = Clock::current().now();
     gLog.log("Restoring entries of <%@> from saved XML files...", feed.mURL.getValue());
     feed.recoverFromXMLData();
     gLog.log("...Finished restoring entries in %.2f sec", Clock::current().now() - start);
 }
 
+/// There is nothing left in memory that would have to know.
 void markAllAsSeen() {
-    gDatabase->saveRows();
     gDatabase->execute("update Entries set read=1");
     gDatabase->execute("update Subscriptions set unreadCount=0");
     gDatabase->execute("update Enclosures set downloadAuditStatus=2");
-    // What is in memory of them does not know.
-    TableOf<EntryCore>::instance()->uncacheRows();
-    TableOf<EnclosureCore>::instance()->uncacheRows();
 }
 
 }  // namespace
@@ -151,7 +160,9 @@ void TruthRestore::restoreEntries() {
     const auto query = TableOf<FeedCore>::instance()->allRows();
     const Ref<ArrayOf<FeedCore>> feeds = query->allRows();
     for (FeedCore* feed : *feeds) {
+        const AutoreleasePool pool;
         restoreEntriesOf(*feed);
+        forgetRows();
     }
     markAllAsSeen();
     gLog.log("----END restoreEntries");
