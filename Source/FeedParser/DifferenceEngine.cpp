@@ -171,7 +171,7 @@ bool DifferenceEngine::updateExistingEntry(EntryCore* entry) {
     const Ref<EntryCore> newEntry = mMap.entryWithIdentifier(entry->getIdentifier());
     if (!newEntry.get()) return false;
     mTouched.emplace_back(entry);
-    if (entry->mFeed) {
+    if (entry->getFeed()) {
         updateEntry(*entry, newEntry);
     } else {
         insertEntry(entry, newEntry);

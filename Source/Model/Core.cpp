@@ -11,21 +11,6 @@ namespace Orvane {
 using Foundation::gWarn;
 using Foundation::NetError;
 
-namespace {
-
-/// Whether the file has the row. What a table hands out says nothing of that, as a row is read
-/// only when it is used.
-bool exists(SQLite::Table* table, SQLite::RowID rowID) {
-    const SQLite::Row* cached = table->_cachedRowWithID(rowID);
-    if (cached && cached->isLoaded()) return true;
-    SQLite::Query query(
-        table, SQLite::SQLText::format("SELECT rowID FROM %s WHERE rowID=?", table->getName()));
-    query.bindRowID(1, rowID);
-    return SQLite::Cursor(query).hasRow();
-}
-
-}  // namespace
-
 Core::~Core() {
     gLogAPIVerbose.log("Core: deleted %p", static_cast<const void*>(this));
     if (!mOVObject) return;
@@ -34,9 +19,18 @@ Core::~Core() {
               port ? port->getClassName(mOVObject) : nullptr, static_cast<const void*>(mOVObject));
 }
 
+bool Core::_isInFile(SQLite::Table* table, SQLite::RowID rowID) {
+    const SQLite::Row* cached = table->_cachedRowWithID(rowID);
+    if (cached && cached->isLoaded()) return true;
+    SQLite::Query query(
+        table, SQLite::SQLText::format("SELECT rowID FROM %s WHERE rowID=?", table->getName()));
+    query.bindRowID(1, rowID);
+    return SQLite::Cursor(query).hasRow();
+}
+
 Core* Core::_getRow(SQLite::Table* table, SQLite::RowID rowID) {
     // Asked for first, or a table that retains its rows would keep the one that is not there.
-    if (rowID > 0 && !exists(table, rowID)) {
+    if (rowID > 0 && !_isInFile(table, rowID)) {
         gWarn.log("Core::getRow: No such rowID %llu in %s", rowID, table->getName());
         throw Foundation::NetException(NetError::kOrvane, OVInvalidRowIDError);
     }

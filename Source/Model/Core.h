@@ -28,6 +28,9 @@ class Core : public SQLite::ListedRow {
     /// The row of a table of the model, which the current pool keeps. Throws `NetException` with
     /// `OVInvalidRowIDError` if there is none of that ID, `AssertionFailure` for an ID below 1.
     static Core* _getRow(SQLite::Table* table, SQLite::RowID rowID);
+    /// Whether the file has the row. What a table hands out says nothing of that, as a row is read
+    /// only when it is used. Throws `SQLite::Exception`.
+    static bool _isInFile(SQLite::Table* table, SQLite::RowID rowID);
 
     /// Takes a new row out of its table, behind a failure of what was to save it: it would be saved
     /// with whatever is saved next, and could make all of that fail. Does nothing for null and for

@@ -44,6 +44,9 @@ OVObject* EnclosureCore::createOVObject() {
 }
 
 EntryCore* EnclosureCore::getEntry() const {
+    const SQLite::RowID entry = mEntry.getRowID();
+    // An entry that is deleted does not wait for a download that runs.
+    if (entry != 0 && !_isInFile(SQLite::TableOf<EntryCore>::instance(), entry)) return nullptr;
     return mEntry.getValue();
 }
 

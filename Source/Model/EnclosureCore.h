@@ -55,6 +55,7 @@ class EnclosureCore : public CoreOf<EnclosureCore> {
 
     OVObject* createOVObject() override;
 
+    /// Null without one, and if the file has lost it.
     EntryCore* getEntry() const;
     /// Each side of the link sets the other. The entry, which may be null, must outlive the link if
     /// it is not stored.

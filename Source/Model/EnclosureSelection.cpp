@@ -80,8 +80,9 @@ bool EnclosureCore::startAutoDownloads() {
     const Ref<Foundation::ArrayOf<EnclosureCore>> wanted = query.allRows();
     for (EnclosureCore* enclosure : *wanted) {
         gLogDownload.log("Starting auto-download of %@", enclosure);
-        enclosure->download();
+        // First, so that one that cannot even be started does not stand before the others for good.
         attempted() += OVFormat(",%lli", enclosure->getRowID());
+        enclosure->download();
     }
     if (wanted->isEmpty()) gLogDownload.log("Found no enclosures to auto-download");
     return !wanted->isEmpty();

@@ -37,7 +37,7 @@ std::string_view materialOf(const EntryCore& entry) {
 }  // namespace
 
 Foundation::StringReturner EntryCore::computeIdentifier() const {
-    FeedCore* feed = mFeed.getValue();
+    FeedCore* feed = getFeed();
     if (!feed) return nullptr;
     // Nothing stands between the two: stored identifiers are made like this.
     std::string material = feed->getIdentifier()->utf8();

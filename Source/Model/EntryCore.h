@@ -11,8 +11,6 @@ namespace Orvane {
 
 class XMLElement;
 
-class XMLElement;
-
 /// A post of a feed: a row of "Entries". Free until it is merged into the store.
 class EntryCore : public EntryColumns {
  public:
@@ -76,6 +74,7 @@ class EntryCore : public EntryColumns {
     SQLite::RowIterator<EnclosureCore> getEnclosures(const char* condition) const;
     void addToEnclosures(EnclosureCore* enclosure);
     void removeFromEnclosures(EnclosureCore* enclosure);
+    /// Null without one, and if the file has lost it.
     FeedCore* getFeed() const;
     /// The feed, which may be null, must outlive the link if it is not stored.
     void setFeed(FeedCore* feed);

@@ -22,6 +22,9 @@ EntryCore::~EntryCore() {
 }
 
 FeedCore* EntryCore::getFeed() const {
+    const SQLite::RowID feed = mFeed.getRowID();
+    // Nothing could be read of a feed that has gone and left its entry behind.
+    if (feed != 0 && !_isInFile(SQLite::TableOf<FeedCore>::instance(), feed)) return nullptr;
     return mFeed.getValue();
 }
 

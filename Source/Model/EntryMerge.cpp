@@ -94,6 +94,8 @@ void EntryCore::startUpdate(const EntryCore& newEntry) {
 
 void EntryCore::takeCurrent(const EntryCore& newEntry) {
     if (!assign(mCurrent, newEntry.mCurrent) || !mCurrent) return;
+    // What is new was never in the archive, and cannot be identified before it is filled.
+    if (getRowID() == 0 && !mIdentifier) return;
     // It is back in the document, and so no longer in the archive.
     if (FeedCore* feed = getFeed()) feed->deleteEntryFile(getIdentifier());
 }

@@ -34,7 +34,8 @@ void EntryUndo::giveUp(EntryCore* entry) {
         entry->mEnclosures.remove(enclosure);
         giveUpRow(enclosure);
     }
-    const Ref<FeedCore> feed = entry->getFeed();
+    // Whether the file has it does not matter here, and it may be the file that fails.
+    const Ref<FeedCore> feed = entry->mFeed.getValue();
     if (entry->getRowID() == 0) {
         if (feed.get()) feed->removeFromEntries(entry);
         if (entry->getTable()) entry->deleteRow();

@@ -125,7 +125,7 @@ bool FeedCore::recoverEntry(Foundation::URL* url, Data* data) {
         if (!known.get()) {
             if (!adoptRecovered(entry, identifier)) return false;
         } else {
-            if (!known->mFeed) known->setFeed(this);
+            if (!known->getFeed()) known->setFeed(this);
             known->updateFrom(parsed, true);
         }
         takeRecovered(*entry, url);

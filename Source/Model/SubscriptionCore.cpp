@@ -60,6 +60,8 @@ ClientCore* SubscriptionCore::getClient() const {
 }
 
 void SubscriptionCore::setClient(ClientCore* client) {
+    // The old client may have the last reference. An object that nobody owns yet must not get one.
+    const Ref<SubscriptionCore> self = getRefCount() > 0 ? this : nullptr;
     const Ref<ClientCore> old = mClient.getValue();
     if (IsEqual(old.get(), client)) return;
     mClient.setValue(client);
@@ -72,6 +74,8 @@ FeedCore* SubscriptionCore::getFeed() const {
 }
 
 void SubscriptionCore::setFeed(FeedCore* feed) {
+    // The old feed may have the last reference. An object that nobody owns yet must not get one.
+    const Ref<SubscriptionCore> self = getRefCount() > 0 ? this : nullptr;
     const Ref<FeedCore> old = mFeed.getValue();
     if (IsEqual(old.get(), feed)) return;
     mFeed.setValue(feed);

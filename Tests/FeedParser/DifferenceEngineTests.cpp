@@ -253,6 +253,18 @@ TEST_F(DifferenceEngineTest, AdoptsAGhostWithItsFlags) {
     EXPECT_EQ(count("Entries where feed=1"), 2);
 }
 
+TEST_F(DifferenceEngineTest, AdoptsAnEntryWhoseFeedIsGone) {
+    merge({{"a", "One"}});
+    entry("a")->setRead(true);
+    db().saveRows();
+    TableOf<EntryCore>::instance()->uncacheRows();
+    db().execute("update Entries set feed=99");
+    EXPECT_EQ(merge({{"a", "One"}}), "changed 0 1 0");
+    EXPECT_EQ(stateOf("a"), "current read");
+    EXPECT_EQ(entry("a")->getFeed(), feed);
+    EXPECT_EQ(count("Entries where feed=1"), 1);
+}
+
 TEST_F(DifferenceEngineTest, ComparesEveryEntryIfForced) {
     merge({{"a", "One"}, {"b", "Two"}});
     const LoggingOn on({&gLogSub});

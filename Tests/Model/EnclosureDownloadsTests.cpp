@@ -135,6 +135,16 @@ TEST_F(EnclosureDownloadsTest, TellsOfItsDownloadByIDs) {
     EXPECT_EQ(takePosts(), "com.tarnwick.orvane.EnclosureDownloadStarted 0,0,0\n");
 }
 
+TEST_F(EnclosureDownloadsTest, TellsOfItsDownloadWhenItsEntryIsGone) {
+    row->download();
+    db().saveRows();
+    db().execute("delete from Entries");
+    TableOf<EntryCore>::instance()->uncacheRows();
+    EXPECT_EQ(row->getEntry(), nullptr);
+    row->postDownloadEnded();
+    EXPECT_EQ(takePosts(), "com.tarnwick.orvane.EnclosureDownloadEnded 0,1,0\n");
+}
+
 TEST_F(EnclosureDownloadsTest, DeletesTheFileAndWhatThereIsOfOne) {
     writeFile(incomplete() / "Data", "12345");
     writeFile(downloads() / "song.mp3", "1234567890");

@@ -47,6 +47,15 @@ TEST_F(EnclosureSelectionTest, StartsAtMostTwoInACallAndEachOnce) {
     EXPECT_TRUE(log.contains("[Download] Found no enclosures to auto-download"));
 }
 
+TEST_F(EnclosureSelectionTest, GetsPastOneThatCannotBeStarted) {
+    const Ref<EnclosureCore> broken = approved("http://e.org/a");
+    const Ref<EnclosureCore> next = approved("http://e.org/b");
+    port.isBroken = true;
+    EXPECT_THROW(EnclosureCore::startAutoDownloads(), std::runtime_error);
+    port.isBroken = false;
+    EXPECT_EQ(start(), "make(2) start ");
+}
+
 TEST_F(EnclosureSelectionTest, StartsOnlyWhatIsApproved) {
     const Ref<EnclosureCore> row = stored("http://e.org/a");
     EXPECT_EQ(start(), "");

@@ -4,6 +4,7 @@
 #include "Model/DownloaderFactory.h"
 #include "Model/EntryTest.h"
 
+#include <stdexcept>
 #include <string>
 
 /// Makes downloaders that keep what they are told. It is the port of the process while it lives.
@@ -26,11 +27,13 @@ class FakeDownloaders : public Orvane::DownloaderFactory {
     Foundation::Returner<Orvane::Downloader> makeDownloader(
         Orvane::EnclosureCore* enclosure) override {
         calls += OVFormat("make(%lli) ", enclosure->getRowID());
+        if (isBroken) throw std::runtime_error("broken");
         return Foundation::Returner<Orvane::Downloader>::adopted(new Fake(*this));
     }
 
     std::string calls;
     long long bytes = 0;
+    bool isBroken = false;
 };
 
 /// A test of enclosures, all of which are of one stored entry.

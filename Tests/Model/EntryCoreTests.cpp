@@ -410,6 +410,27 @@ TEST_F(EntryCoreTest, LosesAFeedThatEndsAndWithItItsIdentity) {
     EXPECT_EQ(textOf(entry->computeIdentifier()), "(null)");
 }
 
+TEST_F(EntryCoreTest, HasNoFeedWhereTheFileHasLostIt) {
+    const Ref<EntryCore> entry = storedEntry("abc");
+    const Ref<EntryCore> archived = storedEntry("def");
+    archived->mCurrent.setValue(false);
+    db().saveRows();
+    db().execute("delete from Feeds");
+    auto* feeds = TableOf<FeedCore>::instance();
+    feeds->uncacheRows();
+    entry->unload();
+    EXPECT_EQ(entry->getFeed(), nullptr);
+    EXPECT_EQ(textOf(entry->computeIdentifier()), "(null)");
+    EXPECT_EQ(textOf(entry->getIdentifier()), hashWithFeed("abc"));
+    entry->setRead(true);
+    entry->saveChanges();
+    archived->deleteRow();
+    EXPECT_EQ(count("Entries where read=1"), 1);
+    EXPECT_EQ(count("Entries"), 1);
+    // Nor does its table keep one that is not there.
+    EXPECT_EQ(feeds->getCachedRowCount(), 0u);
+}
+
 TEST_F(EntryCoreTest, MayLeaveWhatAloneKeepsIt) {
     const AutoreleasePool inner;
     EntryCore* entry = nullptr;

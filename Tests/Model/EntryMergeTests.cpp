@@ -187,6 +187,13 @@ TEST_F(EntryMergeTest, AStoredEntryKeepsWhenItWasFirstSeen) {
     EXPECT_FALSE(log.contains("Adding new entry"));
 }
 
+TEST_F(EntryMergeTest, ANewEntryIsIdentifiedByWhatItTakesOver) {
+    const Ref<EntryCore> entry = newEntry();
+    EXPECT_TRUE(entry->updateFrom(full(), true));
+    EXPECT_TRUE(entry->mCurrent);
+    EXPECT_EQ(textOf(entry->getIdentifier()), sha1(feedHash + "abc"));
+}
+
 TEST_F(EntryMergeTest, NeedsAnEntryToMerge) {
     const LogCapture log;
     const Ref<EntryCore> entry = storedEntry("abc");

@@ -69,6 +69,27 @@ TEST_F(SubscriptionCoreTest, LeavesItsOwnersNewRowsWhenItIsSavedByItself) {
     EXPECT_TRUE(feed->mSubscriptions.getNewRows().empty());
 }
 
+TEST_F(SubscriptionCoreTest, MayLeaveWhatAloneKeepsIt) {
+    const Ref<FeedCore> other = freeFeed("http://example.org/other");
+    const Ref<ClientCore> another = row<ClientCore>();
+    SubscriptionCore* made = nullptr;
+    {
+        const AutoreleasePool inner;
+        made = row<SubscriptionCore>();
+        made->setFeed(feed);
+    }
+    made->setFeed(other);
+    EXPECT_TRUE(feed->mSubscriptions.getNewRows().empty());
+    EXPECT_EQ(made->getRefCount(), 1u);
+    EXPECT_EQ(other->mSubscriptions.getNewRows().size(), 1u);
+    made->setClient(client);
+    made->setFeed(nullptr);
+    EXPECT_EQ(made->getRefCount(), 1u);
+    made->setClient(another);
+    EXPECT_TRUE(client->mSubscriptions.getNewRows().empty());
+    EXPECT_EQ(another->mSubscriptions.getNewRows().size(), 1u);
+}
+
 // Intervals.
 
 TEST_F(SubscriptionCoreTest, TakesARefreshIntervalOf0ForTheConstantInTheSettingsAlone) {
