@@ -1,6 +1,8 @@
 #pragma once
 
 #include "Foundation/Dictionary.h"
+#include "Foundation/NotificationCenter.h"
+#include "Foundation/NotificationRecorder.h"
 #include "Foundation/RunningApplications.h"
 #include "Model/FeedTest.h"
 #include "Model/MinistryOfTruth.h"
@@ -79,6 +81,16 @@ class ClientAgent : public Orvane::UnreachableAgent {
         calls += call + " ";
         if (onCall) onCall();
     }
+};
+
+/// What is announced as a change of the schedule, while this lives.
+class Schedule : public NotificationRecorder {
+ public:
+    Schedule() {
+        Foundation::NotificationCenter::getLocal()->addObserver(
+            *this, Orvane::SubscriptionCore::kRefreshScheduleChangedNotification, nullptr);
+    }
+    ~Schedule() { Foundation::NotificationCenter::getLocal()->removeObserver(*this); }
 };
 
 /// A test of clients and subscriptions.
