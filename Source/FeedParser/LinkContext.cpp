@@ -13,28 +13,28 @@ LinkContext::LinkContext(Tag theTag)
       isEnclosure(theTag == EnclosureTag) {}
 
 void LinkContext::gotAttribute(const char* prefix, const char* name, const char* value) {
-    const Ref<String> whole = String::string(value ? value : "");
-    const Ref<String> trimmed = whole->getTrimmedString();
+    const Ref<String> wanted = trimmed(value);
+    if (!wanted.get()) return;
     switch (tagForString(name)) {
         case RelTag:
-            link->mRel = trimmed;
+            link->mRel = wanted.get();
             if (tagForString(value) == EnclosureTag) isEnclosure = true;
             break;
         case TypeTag:
-            link->mType = trimmed.get();
-            enclosure->mMIMEType.setValue(trimmed.get());
+            link->mType = wanted.get();
+            enclosure->mMIMEType.setValue(wanted.get());
             break;
         case TitleTag:
-            link->mTitle = trimmed.get();
-            enclosure->mTitle.setValue(trimmed.get());
+            link->mTitle = wanted.get();
+            enclosure->mTitle.setValue(wanted.get());
             break;
         case HrefTag:
         case URLTag:
-            link->mHref = trimmed.get();
+            link->mHref = wanted.get();
             break;
         case SizeTag:
         case LengthTag:
-            enclosure->mLength.setValue(trimmed->toLongLong());
+            enclosure->mLength.setValue(wanted->toLongLong());
             break;
         default:
             break;

@@ -31,13 +31,16 @@ void TextContext::setType(const char* value) {
         case ApplicationXHTMLXMLTag:
             contentType = XHTML;
             break;
-        default: {
+        default:
             contentType = Other;
-            const Ref<String> whole = String::string(value ? value : "");
-            typeString = whole->getTrimmedString();
+            typeString = trimmed(value);
             break;
-        }
     }
+}
+
+Foundation::StringReturner TextContext::trimmed(const char* value) {
+    const Ref<String> whole = String::string(value ? value : "");
+    return whole.get() ? whole->getTrimmedString() : nullptr;
 }
 
 void TextContext::decodeEntities(std::string& text) {

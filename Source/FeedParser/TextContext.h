@@ -26,6 +26,9 @@ class TextContext : public Context {
  protected:
     /// Undoes the escapes of `raw` in place, and trims the result.
     static void decodeEntities(std::string& text);
+    /// An attribute's value without outer white space. Null for one that is no UTF-8, as libxml2
+    /// gives it of documents in which it has found errors.
+    static Foundation::StringReturner trimmed(const char* value);
 
  private:
     void setType(const char* value);

@@ -13,6 +13,8 @@ inline constexpr int kElementDepth = 200;
 /// How many inline elements may be open at once in HTML. Tidy repeats each of them in every block
 /// that begins meanwhile, and tells about each time.
 inline constexpr int kOpenInlines = 24;
+/// How many of them Tidy may repeat so in one piece of markup. Those that are open then end.
+inline constexpr int kRepeatedInlines = 3000;
 /// How many attributes of a broken element are kept. Tidy compares each with all others.
 inline constexpr int kMendedAttributes = 200;
 /// How many messages Tidy may write about one document.

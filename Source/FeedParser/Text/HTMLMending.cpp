@@ -108,6 +108,7 @@ void HTMLMending::handleStart(const MarkupToken& token) {
         ++mCounts[name].leftOut;
         return;
     }
+    if (!known.is(HTMLElement::Inline)) limitRepeats();
     ++mCounts[name].open;
     if (!known.is(HTMLElement::ImpliedEnd)) ++mDepth;
     if (known.is(HTMLElement::Inline)) ++mInlines;
@@ -129,6 +130,23 @@ bool HTMLMending::isBeyondBounds(const HTMLElement& element) {
         return true;
     }
     return false;
+}
+
+void HTMLMending::limitRepeats() {
+    mRepeatedInlines += mInlines;
+    if (mRepeatedInlines <= Bounds::kRepeatedInlines) return;
+    if (!mHitRepeats) Bounds::logHit("kRepeatedInlines", Bounds::kRepeatedInlines);
+    mHitRepeats = true;
+    for (auto& [name, count] : mCounts) {
+        const HTMLElement* element = findKnown(name);
+        if (!element || !element->is(HTMLElement::Inline)) continue;
+        for (; count.open > 0; --count.open) {
+            mOut += "</" + name + ">";
+            ++count.leftOut;
+            --mDepth;
+        }
+    }
+    mInlines = 0;
 }
 
 void HTMLMending::handleEnd(const MarkupToken& token) {

@@ -42,6 +42,8 @@ class HTMLMending : Foundation::Uncopyable {
     void handleStart(const MarkupToken& token);
     void handleEnd(const MarkupToken& token);
     bool isBeyondBounds(const HTMLElement& element);
+    /// A block begins. Ends the inline elements that are open if Tidy has repeated enough of them.
+    void limitRepeats();
     void copyTag(const MarkupToken& token);
     void copyAttributes(const MarkupToken& token);
     void copyText(std::string_view text);
@@ -59,8 +61,10 @@ class HTMLMending : Foundation::Uncopyable {
     int mHTMLInForeign = 0;  ///< how many elements are open within them that may hold HTML
     int mDepth = 0;
     int mInlines = 0;
+    int mRepeatedInlines = 0;  ///< how many were open, of all blocks together, as each began
     bool mHitDepth = false;
     bool mHitInlines = false;
+    bool mHitRepeats = false;
     std::unordered_map<std::string, Count> mCounts;
 };
 

@@ -76,8 +76,22 @@ TEST(HTMLMending, BoundsTheDepthAndTheOpenInlines) {
     const std::string inlines = mend(repeated("<font><p>", 100));
     EXPECT_EQ(std::count(inlines.begin(), inlines.end(), 'f'), Bounds::kOpenInlines);
     EXPECT_EQ(log.count("A document has reached the bound \"kOpenInlines\", 24"), 1);
+    EXPECT_EQ(log.count("A document has reached the bound \"kRepeatedInlines\", 3000"), 0);
     EXPECT_EQ(mend(repeated("<p>", 1000)), repeated("<p>", 1000));
     EXPECT_EQ(mend(repeated("<b>x</b>", 1000)), repeated("<b>x</b>", 1000));
+}
+
+TEST(HTMLMending, EndsOpenInlinesThatWereRepeatedOftenEnough) {
+    const Support::LoggingOn on({&Orvane::gLogParser});
+    const Support::LogCapture log;
+    constexpr int kBlocks = Bounds::kRepeatedInlines / 2;
+    const std::string opened = "<b><i>" + repeated("<p>x", kBlocks);
+    EXPECT_EQ(mend(opened), opened);
+    const std::string ended = mend(opened + "<p>y</i></b><b><p>z</b>");
+    EXPECT_TRUE(ended == opened + "</b></i><p>y<b></b><p>z" ||
+                ended == opened + "</i></b><p>y<b></b><p>z")
+        << ended.substr(opened.size());
+    EXPECT_EQ(log.count("A document has reached the bound \"kRepeatedInlines\", 3000"), 1);
 }
 
 TEST(HTMLMending, BoundsTheAttributes) {

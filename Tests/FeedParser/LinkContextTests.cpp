@@ -1,0 +1,40 @@
+#include "FeedParser/LinkContext.h"
+
+#include "Foundation/AutoreleasePool.h"
+#include "SQLite/Database.h"
+
+#include <gtest/gtest.h>
+
+using namespace Foundation;
+using namespace Orvane::FeedParser;
+
+namespace {
+
+class LinkContextTest : public testing::Test {
+ protected:
+    LinkContextTest() { SQLite::Database::initialize(); }
+    ~LinkContextTest() noexcept override {}
+
+    AutoreleasePool pool;
+    Ref<LinkContext> context{new LinkContext(LinkTag)};
+};
+
+TEST_F(LinkContextTest, TakesValuesWithoutOuterWhiteSpace) {
+    context->gotAttribute(nullptr, "href", " x\n");
+    context->gotAttribute(nullptr, "length", " 12 ");
+    EXPECT_EQ(context->link->mHref->utf8(), "x");
+    EXPECT_EQ(context->enclosure->mLength.getValue(), 12);
+}
+
+TEST_F(LinkContextTest, IgnoresValuesThatAreNoUTF8) {
+    for (const char* name : {"rel", "type", "title", "href", "length"}) {
+        context->gotAttribute(nullptr, name, "\xFF");
+    }
+    EXPECT_EQ(context->link->mRel.get(), nullptr);
+    EXPECT_EQ(context->link->mType.get(), nullptr);
+    EXPECT_EQ(context->link->mTitle.get(), nullptr);
+    EXPECT_EQ(context->link->mHref.get(), nullptr);
+    EXPECT_EQ(context->typeString.get(), nullptr);
+}
+
+}  // namespace
