@@ -63,7 +63,8 @@ extern "C" int LLVMFuzzerTestOneInput(const unsigned char* bytes, std::size_t si
     checkSafe(tidy<XMLSnippetTidier>(markup, encoding, base.get()), base.get());
     tidy<HTMLDocumentTidier>(markup, encoding, nullptr);
     const TidyResult feed = tidy<FeedTidier>(markup, encoding, nullptr);
-    const bool hasRoot = feed.output.find('>') != std::string::npos;
+    const bool hasRoot =
+        feed.output.find("</") != std::string::npos || feed.output.find("/>") != std::string::npos;
     if (feed.isSuccess() && hasRoot && encoding == 1) require(isWellFormed(feed.output));
     return 0;
 }
