@@ -1,6 +1,5 @@
 #include "Benchmarks/Measure.h"
 #include "FeedParser/Text/HTMLSnippetTidier.h"
-#include "FeedParser/Text/MarkupLook.h"
 #include "FeedParser/Text/TidyDocument.h"
 #include "FeedParser/Text/XMLSnippetTidier.h"
 #include "Foundation/AutoreleasePool.h"
@@ -87,14 +86,14 @@ std::vector<Content> readContents(const std::filesystem::path& folder) {
     return contents;
 }
 
-void reportTexts(const std::vector<Content>& contents) {
-    std::size_t bytes = 0, small = 0;
+void reportContents(const std::vector<Content>& contents, const Tidier& html, const Tidier& xml) {
+    std::size_t bytes = 0, here = 0;
     for (const Content& content : contents) {
         bytes += content.data->getLength();
-        if (MarkupLook::isSmallAndShallow(content.data->view())) ++small;
+        if ((content.isXML ? xml : html).mayTidyHere(content.data->view())) ++here;
     }
     std::printf("%zu contents of %zu bytes, %zu of them tidied in place\n", contents.size(), bytes,
-                small);
+                here);
 }
 
 }  // namespace
@@ -107,9 +106,9 @@ int main() {
     }
     const AutoreleasePool pool;
     const std::vector<Content> contents = readContents(std::filesystem::path(corpus) / "real");
-    reportTexts(contents);
     const Ref<HTMLSnippetTidier> html = Returner<HTMLSnippetTidier>::adopted(new HTMLSnippetTidier);
     const Ref<XMLSnippetTidier> xml = Returner<XMLSnippetTidier>::adopted(new XMLSnippetTidier);
+    reportContents(contents, *html.get(), *xml.get());
     const Ref<URL> base = URL::url(String::string("http://example.org/feeds/index.xml"));
     Bare<HTMLSnippetTidier> bareHTML;
     Bare<XMLSnippetTidier> bareXML;
