@@ -1,7 +1,7 @@
 #include "Benchmarks/Measure.h"
 #include "FeedParser/DifferenceEngine.h"
-#include "FeedParser/DocumentReader.h"
 #include "FeedParser/Parser.h"
+#include "FeedParser/ParserPort.h"
 #include "Foundation/Data.h"
 #include "Foundation/URL.h"
 #include "Model/ContentCore.h"
@@ -351,8 +351,8 @@ int main() {
     setenv("XDG_DATA_HOME", base.path().c_str(), 1);
     const Support::LogCapture quiet;
     FakeCenter noBus;
-    FeedParser::DocumentReader reader;
-    DocumentParser::setCurrent(&reader);
+    FeedParser::ParserPort parser;
+    DocumentParser::setCurrent(&parser);
     MergingFeeders feeders;
     FeederFactory::setCurrent(&feeders);
     try {

@@ -1,4 +1,4 @@
-#include "FeedParser/DocumentReader.h"
+#include "FeedParser/ParserPort.h"
 
 #include "Foundation/AutoreleasePool.h"
 #include "Foundation/Data.h"
@@ -19,21 +19,21 @@ constexpr const char* kFeed =
 constexpr const char* kEntry = "<item><title>Alone</title><guid>1</guid></item>";
 constexpr const char* kPage = "<html><head><title>A page</title></head><body/></html>";
 
-class DocumentReaderTest : public testing::Test {
+class ParserPortTest : public testing::Test {
  protected:
-    ~DocumentReaderTest() noexcept override = default;
+    ~ParserPortTest() noexcept override = default;
 
     static Data* data(const char* text) { return Data::adopt(text); }
-    FeedCore* feed(const char* text) { return reader.parseFeed(data(text), nullptr); }
-    EntryCore* entry(const char* text) { return reader.parseEntry(data(text), nullptr); }
+    FeedCore* feed(const char* text) { return port.parseFeed(data(text), nullptr); }
+    EntryCore* entry(const char* text) { return port.parseEntry(data(text), nullptr); }
 
     AutoreleasePool pool;
-    FeedParser::DocumentReader reader;
+    FeedParser::ParserPort port;
 };
 
 }  // namespace
 
-TEST_F(DocumentReaderTest, GivesTheFeedWithItsEntries) {
+TEST_F(ParserPortTest, GivesTheFeedWithItsEntries) {
     FeedCore* const found = feed(kFeed);
     ASSERT_TRUE(found);
     EXPECT_EQ(found->mTitle.getValue()->utf8(), "A feed");
@@ -41,18 +41,18 @@ TEST_F(DocumentReaderTest, GivesTheFeedWithItsEntries) {
     EXPECT_FALSE(found->getTable());
 }
 
-TEST_F(DocumentReaderTest, GivesASingleEntry) {
+TEST_F(ParserPortTest, GivesASingleEntry) {
     EntryCore* const found = entry(kEntry);
     ASSERT_TRUE(found);
     EXPECT_EQ(found->mTitle.getValue()->utf8(), "Alone");
     EXPECT_FALSE(found->mFeed);
 }
 
-TEST_F(DocumentReaderTest, GivesNothingForOtherDocuments) {
+TEST_F(ParserPortTest, GivesNothingForOtherDocuments) {
     EXPECT_FALSE(feed(kEntry));
     EXPECT_FALSE(feed(kPage));
     EXPECT_FALSE(feed(""));
     EXPECT_FALSE(entry(kFeed));
     EXPECT_FALSE(entry(kPage));
-    EXPECT_FALSE(Ref<FeedCore>(reader.parseFeed(nullptr, nullptr)).get());
+    EXPECT_FALSE(Ref<FeedCore>(port.parseFeed(nullptr, nullptr)).get());
 }
