@@ -108,29 +108,44 @@ bool isUnreadable(const xmlNode* node) {
            xmlStrcasecmp(node->name, reinterpret_cast<const xmlChar*>("xml")) == 0;
 }
 
+/// Leaves a node only what XML can hold.
+void mendContent(xmlNode* node) {
+    const std::string_view content = xmlView(node->content);
+    const std::string allowed = allowedInXML(content);
+    if (allowed != content) xmlNodeSetContent(node, xmlChars(allowed));
+}
+
 bool isName(const xmlChar* name) {
     return xmlValidateName(name, 0) == 0;
 }
 
-/// Gives an element a name that XML has, and leaves it only attributes of such names.
-void mendNames(xmlNode* element) {
+/// Gives an element a name that XML has, and leaves it only attributes of such names and with
+/// values that XML can hold.
+void mendElement(xmlNode* element) {
     if (!isName(element->name)) {
         const std::string name = "_" + std::string(xmlView(element->name));
         xmlNodeSetName(element, xmlChars(isName(xmlChars(name)) ? name : "_"));
     }
     for (xmlAttr* attribute = element->properties; attribute;) {
         xmlAttr* next = attribute->next;
+        for (xmlNode* text = attribute->children; text; text = text->next) {
+            mendContent(text);
+        }
         if (!isName(attribute->name)) xmlRemoveProp(attribute);
         attribute = next;
     }
 }
 
-/// Takes what is no XML out of a tree that a tolerant parser made: HTML has comments and
-/// names of its own, and a document in a document brings its declaration along.
+/// Takes what is no XML out of a tree that a tolerant parser made: HTML has comments, names and
+/// characters of its own, and a document in a document brings its declaration along.
 void removeUnreadable(xmlNode* root) {
     for (xmlNode* node = root; node;) {
         xmlNode* next = nextNode(node, root);
-        if (node->type == XML_ELEMENT_NODE) mendNames(node);
+        if (node->type == XML_ELEMENT_NODE) {
+            mendElement(node);
+        } else {
+            mendContent(node);
+        }
         if (isUnreadable(node)) {
             xmlUnlinkNode(node);
             xmlFreeNode(node);

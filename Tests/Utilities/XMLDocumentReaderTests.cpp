@@ -104,6 +104,8 @@ TEST(XMLDocumentReader, LeavesNothingThatCouldNotBeReadAgain) {
     EXPECT_EQ(
         read("<div><p:8>x</p:8></div>", XMLTolerance::HTML),
         "<html xmlns=\"http://www.w3.org/1999/xhtml\"><body><div><_8>x</_8></div></body></html>");
+    EXPECT_EQ(read(std::string("\xFF\xFE<\0p\0>\0\x01\0x\0", 12), XMLTolerance::HTML),
+              "<html xmlns=\"http://www.w3.org/1999/xhtml\"><body><p>x</p></body></html>");
     EXPECT_EQ(read("<p .x='1' y='2'>\x02</p>", XMLTolerance::HTML),
               "<html xmlns=\"http://www.w3.org/1999/xhtml\"><body><p y=\"2\"/></body></html>");
 }
