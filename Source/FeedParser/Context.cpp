@@ -1,12 +1,6 @@
 #include "FeedParser/Context.h"
 
-#include "Foundation/String.h"
-
 namespace Orvane::FeedParser {
-
-using Foundation::Ref;
-using Foundation::String;
-using Foundation::URL;
 
 bool Context::handleFinishedChild(Context*) {
     return true;
@@ -15,9 +9,7 @@ bool Context::handleFinishedChild(Context*) {
 void Context::gotAttribute(const char*, const char*, const char*) {}
 
 Foundation::URLReturner Context::getBaseURL() const {
-    if (!baseURI) return nullptr;
-    const Ref<String> text = String::string(baseURI);
-    return URL::lenientURL(text.get(), nullptr);
+    return info->getBaseURL(baseURI);
 }
 
 }  // namespace Orvane::FeedParser

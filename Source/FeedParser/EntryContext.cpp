@@ -5,6 +5,7 @@
 #include "FeedParser/DateContext.h"
 #include "FeedParser/GUIDContext.h"
 #include "FeedParser/LinkContext.h"
+#include "FeedParser/Text/Bounds.h"
 
 namespace Orvane::FeedParser {
 
@@ -103,6 +104,8 @@ void EntryContext::takeGUID(Context* child) {
 void EntryContext::takeLink(Context* child) {
     const auto* context = static_cast<LinkContext*>(child);
     if (context->isEnclosure) {
+        if (mEnclosures == Bounds::kEnclosures) Bounds::logHit("enclosures", mEnclosures);
+        if (mEnclosures++ >= Bounds::kEnclosures) return;
         entry->addToEnclosures(context->enclosure.get());
     } else if (!entry->mAlternateURL.getValue() && context->link->isAlternate()) {
         const Ref<URL> url = context->link->getURL();

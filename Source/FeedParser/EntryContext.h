@@ -3,6 +3,8 @@
 #include "FeedParser/Context.h"
 #include "Model/EntryCore.h"
 
+#include <cstddef>
+
 namespace Orvane::FeedParser {
 
 /// An entry of a feed, or of no feed.
@@ -25,6 +27,8 @@ class EntryContext : public Context {
     void takeGUID(Context* child);
     void takeLink(Context* child);
     void keepXML();
+
+    std::size_t mEnclosures = 0;
 };
 
 }  // namespace Orvane::FeedParser

@@ -48,7 +48,7 @@ bool FeedContext::handleFinishedChild(Context* child) {
             feed->addToEntries(static_cast<EntryContext*>(child)->entry.get());
             return true;
         case DescriptionTag:
-            takeDescription(child);
+            description = static_cast<ContentContext*>(child)->content;
             return true;
         case LinkTag:
             takeLink(child);
@@ -66,6 +66,7 @@ bool FeedContext::takeText(Context* child) {
         case ContentTag:
         case EncodedTag:
             feed->mSubtitle.setValue(text());
+            description = nullptr;
             return true;
         case IDTag:
             feed->mID.setValue(text());
@@ -119,11 +120,6 @@ void FeedContext::takeLink(Context* child) {
         feed->mAlternateURL.setValue(url.get());
     }
     info->addLink(link);
-}
-
-void FeedContext::takeDescription(Context* child) {
-    const ContentCore* content = static_cast<ContentContext*>(child)->content.get();
-    feed->mSubtitle.setValue(content->getPlainTextString());
 }
 
 void FeedContext::end() {

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "FeedParser/Context.h"
+#include "Model/ContentCore.h"
 #include "Model/FeedCore.h"
 
 namespace Orvane::FeedParser {
@@ -18,6 +19,8 @@ class FeedContext : public Context {
     void end() override;
 
     Foundation::Ref<FeedCore> feed;
+    /// The last description, unless another child gave the subtitle after it.
+    Foundation::Ref<ContentCore> description;
 
  private:
     void setFormat(Info::Format format);
@@ -25,7 +28,6 @@ class FeedContext : public Context {
     bool takeURL(Context* child);
     bool takeDate(Context* child);
     void takeLink(Context* child);
-    void takeDescription(Context* child);
 };
 
 }  // namespace Orvane::FeedParser

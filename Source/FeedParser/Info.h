@@ -10,6 +10,7 @@
 #include "Foundation/TimeZone.h"
 #include "Foundation/URL.h"
 #include "Model/AuthorCore.h"
+#include "Model/ContentCore.h"
 #include "Model/EntryCore.h"
 #include "Model/FeedCore.h"
 
@@ -50,6 +51,9 @@ class Info : public Foundation::RefCounted {
     /// A hundredth of a second before what it gave last, or before the time at which this was made:
     /// so entries keep the document's order, in which the first is the newest.
     Foundation::DateReturner getNextEntryCreationDate();
+    /// The URL of a text that contexts have for their base, which must live as long as the parse;
+    /// null for null, and if it is none or too long. Most ask for the same one after the other.
+    Foundation::URLReturner getBaseURL(const char* text);
 
     Parser* parser;  ///< not owned
     Foundation::Ref<Foundation::URL> url;
@@ -60,6 +64,7 @@ class Info : public Foundation::RefCounted {
     Format format = UnknownFormat;
     Foundation::Ref<HTMLPage> page;
     Foundation::Ref<FeedCore> feed;
+    Foundation::Ref<ContentCore> description;  ///< what the feed's subtitle is to be made of
     Foundation::Ref<EntryCore> entry;
     Foundation::Ref<Friend> friend_;
     // Null while there are none.
@@ -68,6 +73,10 @@ class Info : public Foundation::RefCounted {
     Foundation::Ref<Foundation::MutableArrayOf<HTMLLink>> links;
     double nextEntryCreationTime;  ///< absolute
     bool done = false;             ///< nothing more is to be read
+
+ private:
+    const char* mBaseText = nullptr;  ///< what `mBaseURL` was made of
+    Foundation::Ref<Foundation::URL> mBaseURL;
 };
 
 }  // namespace Orvane::FeedParser

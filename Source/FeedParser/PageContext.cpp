@@ -2,6 +2,7 @@
 
 #include "FeedParser/BaseContext.h"
 #include "FeedParser/LinkContext.h"
+#include "FeedParser/Text/Bounds.h"
 
 namespace Orvane::FeedParser {
 
@@ -19,6 +20,9 @@ bool PageContext::handleFinishedChild(Context* child) {
         return true;
     }
     if (child->tag != BaseTag) return false;
+    // Each changes all links so far.
+    if (mBases == Bounds::kPageBases) Bounds::logHit("bases of a page", Bounds::kPageBases);
+    if (mBases++ >= Bounds::kPageBases) return true;
     const Ref<URL> url = static_cast<BaseContext*>(child)->getURL();
     page->setBaseURL(url.get());
     return true;

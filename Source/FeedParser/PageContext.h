@@ -14,6 +14,9 @@ class PageContext : public Context {
     void start() override;
 
     Foundation::Ref<HTMLPage> page;
+
+ private:
+    int mBases = 0;
 };
 
 }  // namespace Orvane::FeedParser

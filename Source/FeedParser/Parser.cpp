@@ -1,8 +1,8 @@
 #include "FeedParser/Parser.h"
 
+#include "FeedParser/DocumentGuard.h"
 #include "FeedParser/EncodingAliases.h"
 #include "FeedParser/LibXMLHooks.h"
-#include "FeedParser/PageContext.h"
 #include "Foundation/AutoreleasePool.h"
 #include "Foundation/Guard.h"
 #include "Foundation/Logger.h"
@@ -10,7 +10,7 @@
 
 #include <libxml/encoding.h>
 #include <libxml/xmlreader.h>
-#include <limits>
+#include <utility>
 
 namespace Orvane::FeedParser {
 
@@ -51,28 +51,35 @@ void readerError(void* parser, const char* message, xmlParserSeverities severity
 /// What libxml2 holds and has set while an attempt lasts, in the order in which that is made.
 class Parser::Attempt : Foundation::Uncopyable {
  public:
-    explicit Attempt(Parser& parser) : mParser(parser), mHooks(parser) {}
+    explicit Attempt(Parser& parser)
+        : mParser(parser), mHooks(parser), mInput(parser.mData->asBytes(), parser.mBudget) {}
     ~Attempt() {
         // Closing frees the document as well, unless its first element was seen.
         mNextDocument.release();
         xmlTextReaderClose(mParser.mReader);
         xmlFreeTextReader(std::exchange(mParser.mReader, nullptr));
         xmlFreeDoc(std::exchange(mParser.mDoc, nullptr));
+        if (mInput.isOverBudget()) mParser.mIsOverBudget = true;
     }
+
+    DocumentInput& input() { return mInput; }
 
  private:
     Parser& mParser;
     LibXMLHooks mHooks;
+    DocumentInput mInput;
     EntitySubset::NextDocument mNextDocument;
 };
 
-Parser::Parser(Data* data, URL* url) : mInfo(new Info(this, url)), mData(data) {
+Parser::Parser(Data* data, URL* url)
+    : mInfo(new Info(this, url)), mBudget(Data::asBytes(data).getLength()) {
     const AutoreleasePool pool;
     [[maybe_unused]] static const bool sIsSetUp = [] {
         registerEncodingAliases();
         EntitySubset::shared();
         return true;
     }();
+    mData = DocumentGuard::check(data);
     startParsing();
     postprocess();
 }
@@ -86,8 +93,12 @@ void Parser::startParsing() {
     do {
         mFatalError = false;
         attemptParse();
-    } while (mFatalError && mAttempt != kAttempts);
+    } while (mFatalError && mayTryAgain());
     gLogParser.log("Finished parsing; mAttempt=%i, mFatalError=%i", mAttempt, mFatalError);
+}
+
+bool Parser::mayTryAgain() const {
+    return mAttempt != kAttempts && !mIsOverBudget;
 }
 
 void Parser::attemptParse() {
@@ -119,20 +130,20 @@ void Parser::clearAttempt() {
     mSawFirstElement = false;
     mRawBytes = 0;
     mEntries = 0;
+    mEntityBytes = 0;
+    mHitRawBytes = false;
     mStopped = false;
+    mIsUTF8.reset();
     mContextStack.clear();
 }
 
-bool Parser::openReader(Attempt&) {
+bool Parser::openReader(Attempt& attempt) {
     constexpr int kOptions = XML_PARSE_RECOVER | XML_PARSE_NONET | XML_PARSE_NOCDATA;
-    const Foundation::Bytes bytes = mData->asBytes();
     const Ref<String> base = mInfo->url.get() ? mInfo->url->getString() : nullptr;
-    constexpr std::size_t kLongest = std::numeric_limits<int>::max();
-    if (bytes.getLength() <= kLongest) {
-        mReader = xmlReaderForMemory(bytes.view().data(), static_cast<int>(bytes.getLength()),
-                                     base.get() ? base->utf8().c_str() : nullptr,
-                                     forcedEncoding(mAttempt), kOptions);
-    }
+    // Piece by piece, so that it can be ended where it takes too long.
+    mReader = xmlReaderForIO(DocumentInput::read, nullptr, &attempt.input(),
+                             base.get() ? base->utf8().c_str() : nullptr, forcedEncoding(mAttempt),
+                             kOptions);
     if (!mReader) {
         gWarn.log("FeedParser:  xmlReaderForMemory() failed!");
         return false;
@@ -171,14 +182,7 @@ void Parser::learnFromFirstAttempt() {
         const xmlChar* name = xmlTextReaderConstEncoding(mReader);
         mEncoding = xmlParseCharEncoding(reinterpret_cast<const char*>(name));
     }
-    if (isPage()) mTidyAsHTML = true;
-}
-
-bool Parser::isPage() const {
-    if (mInfo->kind == Info::PageKind && mInfo->page.get()) return true;
-    // One that broke while it was open as well: as XML it would lose the links behind its first
-    // element without an end.
-    return mContextStack.size() > 1 && mContextStack[1]->tag == HTMLTag;
+    if (mInfo->kind == Info::PageKind && mInfo->page.get()) mTidyAsHTML = true;
 }
 
 void Parser::unwind() {
@@ -190,6 +194,10 @@ void Parser::unwind() {
 void Parser::postprocess() {
     FeedCore* feed = mInfo->getFeed();
     if (!feed) return;
+    // Plain text is made of markup that is tidied first: only of what counted in the end.
+    if (const ContentCore* description = mInfo->description.get()) {
+        feed->mSubtitle.setValue(description->getPlainTextString());
+    }
     feed->setXMLData(mData.get());
     const bool hasAuthors = mInfo->defaultAuthors.get() || mInfo->defaultContributors.get();
     const bool hasTime = mInfo->defaultTimePublished.get() || mInfo->defaultTimeZonePublished.get();

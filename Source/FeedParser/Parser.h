@@ -1,6 +1,7 @@
 #pragma once
 
 #include "FeedParser/Context.h"
+#include "FeedParser/DocumentInput.h"
 #include "FeedParser/EntitySubset.h"
 #include "FeedParser/Info.h"
 #include "FeedParser/RawXML.h"
@@ -22,11 +23,15 @@ struct _xmlTextReader;
 
 namespace Orvane::FeedParser {
 
+class Tidier;
+
 /// Finds out what a document of bytes from anywhere is: a feed, a single entry, a web page, a
 /// person, or nothing. All work is done as the parser is made; read the `Info` and drop it.
 ///
 /// The document is taken as hostile, and as badly made: up to four attempts are made at it, with
 /// repairs in between. Bad input throws nothing and opens no file and no connection.
+///
+/// REQUIRES: `SQLite::Database::initialize` was called; the database need not be open.
 ///
 /// Sets hooks of libxml2 that hold for the process: one parser at a time, on one thread.
 class Parser : Foundation::Uncopyable {
@@ -60,6 +65,7 @@ class Parser : Foundation::Uncopyable {
     void attemptParse();
     void clearAttempt();
     bool openReader(Attempt& attempt);
+    bool mayTryAgain() const;
     void readDocument();
     void learnFromFirstAttempt();
     void unwind();
@@ -67,16 +73,17 @@ class Parser : Foundation::Uncopyable {
     // Mending, before the second attempt.
 
     bool tidyDocument();
-    bool isPage() const;
+    Foundation::DataReturner tidyAsHTML(Tidier& tidier);
 
     // The document's elements.
 
     void handleStartElement();
     void handleFirstElement();
-    void pushContext(const _xmlNode* element);
+    bool pushContext(const _xmlNode* element);
     void handleContent(_xmlNode* element, Context* context);
     bool readXML(Context* context, bool outer);
-    std::optional<std::string> writeXML(_xmlNode* element, const Context* context, bool outer);
+    bool keepXML(_xmlNode* element, Context* context, bool outer);
+    bool mayKeepXML(const Context* context);
     void handleAttributes(const _xmlNode* element);
     void advanceReaderToElementEnd(Tag tag);
     void handleEndElement();
@@ -84,6 +91,8 @@ class Parser : Foundation::Uncopyable {
     void popTopAndHandleIt();
 
     void noteError(int code);
+    bool claimsToBeUTF8() const;
+    bool isUTF8();
     void stopAfterTooManyErrors(void* locator);
 
     std::int32_t mAttempt = 0;  ///< how many attempts have failed
@@ -102,9 +111,14 @@ class Parser : Foundation::Uncopyable {
     std::vector<Foundation::Ref<Context>> mContextStack;  ///< the root first
 
     RawXML mRawXML;
-    std::size_t mRawBytes = 0;  ///< raw XML that contexts got in this attempt
-    std::size_t mEntries = 0;   ///< in this attempt
-    bool mStopped = false;      ///< this attempt went beyond a bound
+    std::size_t mRawBytes = 0;     ///< raw XML that contexts got in this attempt
+    std::size_t mEntries = 0;      ///< in this attempt
+    std::size_t mEntityBytes = 0;  ///< what entities in attributes came to in this attempt
+    bool mHitRawBytes = false;     ///< in this attempt
+    bool mStopped = false;         ///< too many errors in this attempt
+    bool mIsOverBudget = false;    ///< no further attempt may be made
+    ParseBudget mBudget;
+    std::optional<bool> mIsUTF8;  ///< whether the bytes are, once somebody asked in this attempt
     int mAttemptCount = 0;
     const char* mTidierName = nullptr;
 };

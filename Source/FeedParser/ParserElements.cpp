@@ -1,14 +1,18 @@
 #include "FeedParser/Parser.h"
 #include "FeedParser/Text/Bounds.h"
+#include "FeedParser/Text/XMLMending.h"
 #include "Foundation/AutoreleasePool.h"
 #include "Foundation/Logger.h"
 
 #include <libxml/xmlreader.h>
 #include <cstring>
+#include <limits>
+#include <utility>
 
 namespace Orvane::FeedParser {
 
 using Foundation::AutoreleasePool;
+using Foundation::Data;
 using Foundation::Ref;
 
 namespace {
@@ -44,6 +48,54 @@ bool hasOwnBase(const xmlNode* element) {
     return false;
 }
 
+/// Reads the values of attributes, with the entities that they refer to up to a bound.
+class AttributeText {
+ public:
+    /// `entityBytes` counts what entities have come to so far.
+    explicit AttributeText(std::size_t& entityBytes) : mEntityBytes(entityBytes) {}
+
+    std::string read(const xmlNode* parts) {
+        append(parts, 0);
+        return std::move(mText);
+    }
+
+ private:
+    void append(const xmlNode* part, int depth) {
+        constexpr int kDeepest = 16;
+        for (; part && depth < kDeepest; part = part->next) {
+            if (part->type == XML_TEXT_NODE) {
+                appendText(asText(part->content), depth);
+            } else if (part->type == XML_ENTITY_REF_NODE && part->children && isWithinBound()) {
+                append(reinterpret_cast<const xmlEntity*>(part->children)->children, depth + 1);
+            }
+        }
+    }
+
+    void appendText(const char* text, int depth) {
+        if (!text) return;
+        const std::size_t before = mText.size();
+        mText += text;
+        if (depth > 0) mEntityBytes += mText.size() - before;
+    }
+
+    bool isWithinBound() {
+        // A reference costs something as well, also one to an empty entity.
+        constexpr std::size_t kReferenceBytes = 8;
+        constexpr std::size_t kHit = std::numeric_limits<std::size_t>::max();
+        if (mEntityBytes <= Bounds::kEntityBytes) {
+            mEntityBytes += kReferenceBytes;
+            return true;
+        }
+        if (std::exchange(mEntityBytes, kHit) != kHit) {
+            Bounds::logHit("bytes of entities", Bounds::kEntityBytes);
+        }
+        return false;
+    }
+
+    std::string mText;
+    std::size_t& mEntityBytes;
+};
+
 /// The element that the reader stands on, its start or its end.
 xmlNodePtr currentElement(xmlTextReaderPtr reader) {
     return xmlTextReaderCurrentNode(reader);
@@ -58,7 +110,7 @@ void Parser::handleStartElement() {
     }
     const xmlNodePtr element = currentElement(mReader);
     const bool isEmpty = xmlTextReaderIsEmptyElement(mReader) == 1;
-    pushContext(element);
+    if (!pushContext(element)) return;
     const Ref<Context> context = mContextStack.back();
     if (isEmpty) {
         handleAttributes(element);
@@ -73,9 +125,18 @@ void Parser::handleFirstElement() {
     if (mDoc) EntitySubset::shared().attachTo(mDoc);
 }
 
-void Parser::pushContext(const xmlNode* element) {
+/// False where the element is one entry too many.
+bool Parser::pushContext(const xmlNode* element) {
     const ElementName name(element);
+    // A repair has declared the prefix, about which there was no error before it.
+    if (name.uri && XMLMending::isMadeUpNamespace(name.uri)) mUndefinedNamespace = true;
     Ref<Context> child = Context::newChild(name.uri, name.prefix, name.local, mUndefinedNamespace);
+    const bool isEntry = child->tag == EntryTag || child->tag == ItemTag;
+    if (isEntry && ++mEntries > Bounds::kEntries) {
+        Bounds::logHit("entries", Bounds::kEntries);
+        mInfo->done = true;
+        return false;
+    }
     const Context& parent = *mContextStack.back();
     // To ask for the base of each element would walk up to the root each time.
     const bool isAsParent = mContextStack.size() > 1 && !hasOwnBase(element);
@@ -83,6 +144,7 @@ void Parser::pushContext(const xmlNode* element) {
     child->info = mInfo.get();
     mContextStack.push_back(child);
     child->start();
+    return true;
 }
 
 void Parser::handleContent(xmlNodePtr element, Context* context) {
@@ -106,26 +168,32 @@ void Parser::handleContent(xmlNodePtr element, Context* context) {
 
 bool Parser::readXML(Context* context, bool outer) {
     const std::int32_t errorsBefore = mErrorCount;
-    std::optional<std::string> xml;
     // Reads up to the element's end, all of the document for a feed: an error on the way, however
     // slight, makes the attempt fail, so that imperfect documents are repaired.
-    if (const xmlNodePtr element = xmlTextReaderExpand(mReader)) {
-        xml = writeXML(element, context, outer);
-    }
-    if (!xml || mErrorCount != errorsBefore) {
-        gLogParser.log("Fatal error: xmlTextReaderReadOuter/InnerXml failed");
-        mFatalError = true;
-        return false;
-    }
-    if (context->keepsRawXML()) context->raw = std::move(xml);
+    const xmlNodePtr element = xmlTextReaderExpand(mReader);
+    if (element && mErrorCount == errorsBefore && keepXML(element, context, outer)) return true;
+    gLogParser.log("Fatal error: xmlTextReaderReadOuter/InnerXml failed");
+    mFatalError = true;
+    return false;
+}
+
+/// False if the XML cannot be written.
+bool Parser::keepXML(xmlNodePtr element, Context* context, bool outer) {
+    if (!mayKeepXML(context)) return true;
+    context->raw = outer ? mRawXML.outer(element) : mRawXML.inner(element);
+    if (!context->raw) return false;
+    mRawBytes += context->raw->size();
     return true;
 }
 
-std::optional<std::string> Parser::writeXML(xmlNodePtr element, const Context* context,
-                                            bool outer) {
-    if (!context->keepsRawXML() || mFatalError) return std::string();
-    std::optional<std::string> xml = outer ? mRawXML.outer(element) : mRawXML.inner(element);
-    return xml;
+bool Parser::mayKeepXML(const Context* context) {
+    // What is made of a failed attempt is thrown away.
+    if (!context->keepsRawXML() || mFatalError) return false;
+    const std::size_t most =
+        Bounds::kRawXMLBytes + Bounds::kRawXMLFactor * Data::asBytes(mData.get()).getLength();
+    if (mRawBytes <= most) return true;
+    if (!std::exchange(mHitRawBytes, true)) Bounds::logHit("bytes of raw XML", most);
+    return false;
 }
 
 void Parser::handleAttributes(const xmlNode* element) {
@@ -136,16 +204,15 @@ void Parser::handleAttributes(const xmlNode* element) {
         context.gotAttribute(prefix ? "xmlns" : nullptr, prefix ? prefix : "xmlns",
                              asText(space->href));
     }
-    for (xmlAttr* attribute = element->properties; attribute; attribute = attribute->next) {
+    for (const xmlAttr* attribute = element->properties; attribute; attribute = attribute->next) {
         const char* prefix = attribute->ns ? asText(attribute->ns->prefix) : nullptr;
         const xmlNode* text = attribute->children;
         if (text && text->type == XML_TEXT_NODE && !text->next) {
             context.gotAttribute(prefix, asText(attribute->name), asText(text->content));
             continue;
         }
-        xmlChar* value = xmlNodeListGetString(element->doc, attribute->children, 1);
-        context.gotAttribute(prefix, asText(attribute->name), value ? asText(value) : "");
-        xmlFree(value);
+        const std::string value = AttributeText(mEntityBytes).read(text);
+        context.gotAttribute(prefix, asText(attribute->name), value.c_str());
     }
 }
 

@@ -3,10 +3,13 @@
 #include "Foundation/Logger.h"
 #include "Foundation/UTF8.h"
 
+#include <libxml/encoding.h>
 #include <libxml/parser.h>
 #include <libxml/xmlerror.h>
 #include <libxml/xmlreader.h>
+#include <string>
 #include <string_view>
+#include <utility>
 
 namespace Orvane::FeedParser {
 
@@ -54,6 +57,7 @@ void Parser::noteError(int code) {
             break;
         case XML_ERR_INVALID_CHAR:
             // That is how this libxml2 puts it as well, and about control characters too.
+            if (claimsToBeUTF8() && !isUTF8()) mBadUTF8 = true;
             break;
         case XML_NS_ERR_UNDEFINED_NAMESPACE:
             mUndefinedNamespace = true;
@@ -63,8 +67,19 @@ void Parser::noteError(int code) {
     }
 }
 
+bool Parser::isUTF8() {
+    if (!mIsUTF8) mIsUTF8 = Foundation::UTF8::isValid(mData->view());
+    return *mIsUTF8;
+}
+
+bool Parser::claimsToBeUTF8() const {
+    const xmlChar* name = xmlTextReaderConstEncoding(mReader);
+    return !name ||
+           xmlParseCharEncoding(reinterpret_cast<const char*>(name)) == XML_CHAR_ENCODING_UTF8;
+}
+
 void Parser::stopAfterTooManyErrors(void* locator) {
-    if (!std::exchange(mStopped, true)) Bounds::logHit("kParserErrors", Bounds::kParserErrors);
+    if (!std::exchange(mStopped, true)) Bounds::logHit("errors", Bounds::kParserErrors);
     mFatalError = true;
     if (locator) xmlStopParser(static_cast<xmlParserCtxtPtr>(locator));
 }

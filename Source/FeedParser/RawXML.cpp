@@ -1,12 +1,10 @@
 #include "FeedParser/RawXML.h"
 
-#include "Foundation/AssertionFailure.h"
-
 #include <libxml/parserInternals.h>
 #include <libxml/tree.h>
 #include <algorithm>
 #include <cstring>
-#include <string_view>
+#include <memory>
 
 namespace Orvane::FeedParser {
 
@@ -16,6 +14,54 @@ const char* asText(const xmlChar* text) {
     return reinterpret_cast<const char*>(text);
 }
 
+// What does not stand for itself.
+constexpr const char* kTextSpecials = "<>&\r";
+constexpr const char* kAttributeSpecials = "<>&\r\"\n\t";
+
+const char* escapeOf(char special) {
+    switch (special) {
+        case '<':
+            return "&lt;";
+        case '>':
+            return "&gt;";
+        case '&':
+            return "&amp;";
+        case '\r':
+            return "&#13;";
+        case '"':
+            return "&quot;";
+        case '\n':
+            return "&#10;";
+        default:
+            return "&#9;";
+    }
+}
+
+void appendEscaped(const xmlChar* content, const char* specials, std::string& xml) {
+    if (!content) return;
+    const char* text = asText(content);
+    while (true) {
+        const std::size_t plain = std::strcspn(text, specials);
+        xml.append(text, plain);
+        text += plain;
+        if (!*text) return;
+        xml += escapeOf(*text++);
+    }
+}
+
+bool isASCII(const xmlChar* text) {
+    for (; text && *text; ++text) {
+        if (*text >= 0x80) return false;
+    }
+    return true;
+}
+
+/// Whether libxml2 writes the document by the rules of XHTML.
+bool isXHTML(const xmlDoc* document) {
+    const xmlDtd* type = xmlGetIntSubset(document);
+    return type && xmlIsXHTML(type->SystemID, type->ExternalID) == 1;
+}
+
 bool isDeclaredAt(const xmlNode* element, const xmlNs* space) {
     for (const xmlNs* declared = element->nsDef; declared; declared = declared->next) {
         if (declared == space) return true;
@@ -23,131 +69,145 @@ bool isDeclaredAt(const xmlNode* element, const xmlNs* space) {
     return false;
 }
 
-/// The node behind `node` in document order, within the tree of `root`; null behind the last.
-/// References to entities are not entered.
-xmlNode* next(xmlNode* node, const xmlNode* root) {
-    if (node->type == XML_ELEMENT_NODE && node->children) return node->children;
-    while (node != root) {
-        if (node->next) return node->next;
-        node = node->parent;
-    }
-    return nullptr;
-}
-
-/// Text as libxml2 writes it in UTF-8.
-void appendEscaped(std::string_view text, std::string& xml) {
-    std::size_t done = 0;
-    for (std::size_t i = text.find_first_of("<>&\r"); i != std::string_view::npos;
-         i = text.find_first_of("<>&\r", done)) {
-        xml.append(text, done, i - done);
-        switch (text[i]) {
-            case '<':
-                xml += "&lt;";
-                break;
-            case '>':
-                xml += "&gt;";
-                break;
-            case '&':
-                xml += "&amp;";
-                break;
-            default:
-                xml += "&#13;";
-                break;
-        }
-        done = i + 1;
-    }
-    xml.append(text, done);
-}
-
-/// While it lives, an element declares more namespaces than its own.
-class DeclaredAt : Foundation::Uncopyable {
- public:
-    DeclaredAt(xmlNode* element, const std::vector<xmlNs*>& spaces) {
-        for (const xmlNs* space : spaces) {
-            mDeclarations.push_back(*space);
-            mDeclarations.back().next = nullptr;
-        }
-        for (std::size_t i = 1; i < mDeclarations.size(); ++i) {
-            mDeclarations[i - 1].next = &mDeclarations[i];
-        }
-        if (mDeclarations.empty()) return;
-        mEnd = &element->nsDef;
-        while (*mEnd) {
-            mEnd = &(*mEnd)->next;
-        }
-        *mEnd = mDeclarations.data();
-    }
-    ~DeclaredAt() {
-        if (mEnd) *mEnd = nullptr;
-    }
-
- private:
-    std::vector<xmlNs> mDeclarations;
-    xmlNs** mEnd = nullptr;
-};
-
 }  // namespace
 
-RawXML::RawXML() : mBuffer(xmlBufferCreate()) {
-    OV_ASSERT(mBuffer);
-}
-
-RawXML::~RawXML() {
-    xmlBufferFree(mBuffer);
-}
-
 std::optional<std::string> RawXML::outer(xmlNodePtr element) {
-    std::optional<std::string> xml(std::in_place);
-    if (!append(element, *xml)) xml.reset();
-    return xml;
+    mXML.clear();
+    mFailed = false;
+    append(element);
+    return mFailed ? std::nullopt : std::optional(mXML);
 }
 
 std::optional<std::string> RawXML::inner(xmlNodePtr element) {
-    std::optional<std::string> xml(std::in_place);
+    mXML.clear();
+    mFailed = false;
     for (xmlNodePtr child = element->children; child; child = child->next) {
-        if (!append(child, *xml)) return std::nullopt;
+        append(child);
     }
-    return xml;
+    return mFailed ? std::nullopt : std::optional(mXML);
 }
 
-bool RawXML::append(xmlNodePtr node, std::string& xml) {
-    // Most of what is written is a text alone, for which a buffer of libxml2's is a detour.
-    if (node->type == XML_TEXT_NODE && node->content && node->name == xmlStringText) {
-        appendEscaped(asText(node->content), xml);
+void RawXML::append(xmlNodePtr tree) {
+    const std::size_t begin = mXML.size();
+    mRoot = tree;
+    mNeeded.clear();
+    if (!isXHTML(tree->doc) && appendNode(tree) && declareNeeded()) return;
+    mXML.resize(begin);
+    if (!appendByLibrary(tree)) mFailed = true;
+}
+
+/// False for what is left to libxml2.
+bool RawXML::appendNode(const xmlNode* node) {
+    switch (node->type) {
+        case XML_ELEMENT_NODE:
+            return appendElement(node);
+        case XML_TEXT_NODE:
+            appendEscaped(node->content, kTextSpecials, mXML);
+            return node->name == xmlStringText;
+        case XML_ENTITY_REF_NODE:
+            ((mXML += '&') += asText(node->name)) += ';';
+            return true;
+        case XML_COMMENT_NODE:
+            ((mXML += "<!--") += node->content ? asText(node->content) : "") += "-->";
+            return true;
+        default:
+            return false;
+    }
+}
+
+bool RawXML::appendElement(const xmlNode* element) {
+    if (!appendStartTag(element)) return false;
+    if (!element->children) {
+        mXML += "/>";
         return true;
     }
-    return appendTree(node, xml);
-}
-
-bool RawXML::appendTree(xmlNodePtr node, std::string& xml) {
-    mNeeded.clear();
-    if (node->type == XML_ELEMENT_NODE) collectNamespaces(node);
-    xmlBufferEmpty(mBuffer);
-    const DeclaredAt declared(node, mNeeded);
-    if (xmlNodeDump(mBuffer, node->doc, node, 0, 0) < 0) return false;
-    xml.append(asText(xmlBufferContent(mBuffer)),
-               static_cast<std::size_t>(xmlBufferLength(mBuffer)));
+    mXML += '>';
+    for (const xmlNode* child = element->children; child; child = child->next) {
+        if (!appendNode(child)) return false;
+    }
+    mXML += "</";
+    appendName(element->ns, element->name);
+    mXML += '>';
     return true;
 }
 
-void RawXML::collectNamespaces(xmlNodePtr root) {
-    for (xmlNodePtr node = root; node; node = next(node, root)) {
-        if (node->type != XML_ELEMENT_NODE) continue;
-        need(node->ns, node, root);
-        for (const xmlAttr* attribute = node->properties; attribute; attribute = attribute->next) {
-            need(attribute->ns, node, root);
-        }
+bool RawXML::appendStartTag(const xmlNode* element) {
+    need(element->ns, element);
+    mXML += '<';
+    appendName(element->ns, element->name);
+    for (const xmlNs* space = element->nsDef; space; space = space->next) {
+        if (!appendDeclaration(space)) return false;
     }
+    if (element == mRoot) mDeclarationsEnd = mXML.size();
+    for (const xmlAttr* attribute = element->properties; attribute; attribute = attribute->next) {
+        need(attribute->ns, element);
+        if (!appendAttribute(attribute)) return false;
+    }
+    return true;
 }
 
-void RawXML::need(xmlNsPtr space, xmlNodePtr user, const xmlNode* root) {
+void RawXML::appendName(const xmlNs* space, const xmlChar* name) {
+    if (space && space->prefix) (mXML += asText(space->prefix)) += ':';
+    mXML += asText(name);
+}
+
+bool RawXML::appendDeclaration(const xmlNs* space) {
+    if (!space->href || std::strchr(asText(space->href), '"')) return false;
+    mXML += " xmlns";
+    if (space->prefix) (mXML += ':') += asText(space->prefix);
+    ((mXML += "=\"") += asText(space->href)) += '"';
+    return true;
+}
+
+bool RawXML::appendAttribute(const xmlAttr* attribute) {
+    mXML += ' ';
+    appendName(attribute->ns, attribute->name);
+    mXML += "=\"";
+    for (const xmlNode* part = attribute->children; part; part = part->next) {
+        if (part->type == XML_ENTITY_REF_NODE) {
+            ((mXML += '&') += asText(part->name)) += ';';
+            continue;
+        }
+        // Where the document names no encoding, libxml2 writes references for them.
+        const bool mayBeWide = attribute->doc && attribute->doc->encoding;
+        if (part->type != XML_TEXT_NODE || (!mayBeWide && !isASCII(part->content))) return false;
+        appendEscaped(part->content, kAttributeSpecials, mXML);
+    }
+    mXML += '"';
+    return true;
+}
+
+bool RawXML::appendByLibrary(xmlNodePtr tree) {
+    const std::unique_ptr<xmlNode, decltype(&xmlFreeNode)> copy(xmlDocCopyNode(tree, tree->doc, 1),
+                                                                xmlFreeNode);
+    const std::unique_ptr<xmlBuffer, decltype(&xmlBufferFree)> buffer(xmlBufferCreate(),
+                                                                      xmlBufferFree);
+    if (!copy || !buffer) return false;
+    if (xmlNodeDump(buffer.get(), tree->doc, copy.get(), 0, 0) < 0) return false;
+    mXML.append(asText(xmlBufferContent(buffer.get())),
+                static_cast<std::size_t>(xmlBufferLength(buffer.get())));
+    return true;
+}
+
+void RawXML::need(const xmlNs* space, const xmlNode* user) {
     if (!space || std::find(mNeeded.begin(), mNeeded.end(), space) != mNeeded.end()) return;
     if (space->prefix && std::strcmp(asText(space->prefix), "xml") == 0) return;
     for (const xmlNode* node = user;; node = node->parent) {
         if (isDeclaredAt(node, space)) return;
-        if (node == root) break;
+        if (node == mRoot) break;
     }
     mNeeded.push_back(space);
+}
+
+bool RawXML::declareNeeded() {
+    if (mNeeded.empty()) return true;
+    const std::string rest = mXML.substr(mDeclarationsEnd);
+    mXML.resize(mDeclarationsEnd);
+    for (const xmlNs* space : mNeeded) {
+        if (!appendDeclaration(space)) return false;
+    }
+    mXML += rest;
+    return true;
 }
 
 }  // namespace Orvane::FeedParser

@@ -10,8 +10,7 @@ bool RootContext::handleFinishedChild(Context* child) {
     switch (child->tag) {
         case FeedTag:
         case RSSTag:
-            info->kind = Info::FeedKind;
-            info->feed = static_cast<FeedContext*>(child)->feed;
+            takeFeed(child);
             break;
         case EntryTag:
         case ItemTag:
@@ -31,11 +30,17 @@ bool RootContext::handleFinishedChild(Context* child) {
     return true;
 }
 
+void RootContext::takeFeed(Context* child) {
+    const auto* context = static_cast<FeedContext*>(child);
+    info->kind = Info::FeedKind;
+    info->feed = context->feed;
+    info->description = context->description;
+}
+
 void RootContext::takeRDF(Context* child) {
     auto* rdf = static_cast<RDFContext*>(child);
     if (rdf->sawChannelOrItem) {
-        info->kind = Info::FeedKind;
-        info->feed = rdf->feed;
+        takeFeed(rdf);
     } else if (rdf->sawPerson) {
         info->kind = Info::FriendKind;
         info->friend_ = rdf->friend_;

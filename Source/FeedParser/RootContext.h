@@ -12,6 +12,7 @@ class RootContext : public Context {
     bool handleFinishedChild(Context* child) override;
 
  private:
+    void takeFeed(Context* child);
     void takeRDF(Context* child);
 };
 

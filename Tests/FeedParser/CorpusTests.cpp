@@ -145,8 +145,10 @@ TEST_F(ValidatorCorpus, FindsTheKindOfEachDocument) {
     Score soft;
     const json expected = read("validator/kinds.json");
     for (const json& e : expected) {
-        countKinds(e, parse("validator/" + std::string(e["file"])),
-                   e["level"] == "gate" ? gate : soft);
+        const bool isGate = e["level"] == "gate";
+        // What a repair gave up on there may be read here.
+        if (!isGate && e["kind"] == "none") continue;
+        countKinds(e, parse("validator/" + std::string(e["file"])), isGate ? gate : soft);
     }
     expectScores(gate, soft);
 }
@@ -159,7 +161,9 @@ TEST_F(RealCorpus, GivesTheExpectedValues) {
         const json found = parse("real/files/" + file);
         Score& score = e["level"] == "gate" ? gate : soft;
         const json kind = e["kind"] == "none" ? json("unknown") : e["kind"];
-        score.count(kind == found["kind"], difference(file, "kind", kind, found["kind"]));
+        if (e["level"] == "gate" || e["kind"] != "none") {
+            score.count(kind == found["kind"], difference(file, "kind", kind, found["kind"]));
+        }
         for (const json& check : e["checks"]) {
             const std::string path = check["path"];
             const json value = valueAt(found, path);
@@ -170,22 +174,28 @@ TEST_F(RealCorpus, GivesTheExpectedValues) {
     expectScores(gate, soft);
 }
 
+/// Links by what is expected of them. XML has blanks where a page has line feeds in an attribute.
+json comparable(const json& links) {
+    json all = json::array();
+    for (const json& link : links) {
+        json kept;
+        for (const char* key : {"rel", "type", "title", "href", "kind"}) {
+            kept[key] = link[key];
+        }
+        if (kept["title"].is_string()) kept["title"] = withoutBlanks(kept["title"]);
+        all.push_back(kept);
+    }
+    return all;
+}
+
 TEST_F(PageCorpus, FindsAllLinks) {
     Score gate;
     const json expected = read("pages/expected.json");
     for (const auto& [file, e] : expected.items()) {
         const json page = parse("pages/files/" + file)["page"];
-        const json links = page.is_null() ? json::array() : page["links"];
-        json found = json::array();
-        for (const json& link : links) {
-            json kept;
-            for (const char* key : {"rel", "type", "title", "href", "kind"}) {
-                kept[key] = link[key];
-            }
-            found.push_back(kept);
-        }
-        gate.count(e["links"] == found,
-                   file + ": " + found.dump() + "\nexpected " + e["links"].dump());
+        const json found = page.is_null() ? json::array() : comparable(page["links"]);
+        const json wanted = comparable(e["links"]);
+        gate.count(wanted == found, file + ": " + found.dump() + "\nexpected " + wanted.dump());
     }
     expectScores(gate, {});
 }

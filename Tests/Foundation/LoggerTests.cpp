@@ -77,6 +77,24 @@ std::string describeForFormat(const Talkative*) {
     return "talkative";
 }
 
+TEST(Logger, MovesItsLinesInByFourBlanksAStep) {
+    Support::LogCapture log;
+    Logger logger{"Test", 2};
+    logger.indent();
+    logger.log("a");
+    logger.indent();
+    logger.log("b");
+    logger.outdent();
+    logger.log("c");
+    logger.indent();
+    logger.resetIndentation();
+    logger.log("d");
+    logger.outdent();
+    logger.log("e");
+    EXPECT_EQ(log.lines(), (std::vector<std::string>{"[Test]     a", "[Test]         b",
+                                                     "[Test]     c", "[Test] d", "[Test] e"}));
+}
+
 }  // namespace
 
 TEST(Logger, HasEachFacilityWithItsNameAndDefaultMode) {

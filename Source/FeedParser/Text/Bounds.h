@@ -49,15 +49,18 @@ inline constexpr std::size_t kSubsetBytes = 65536;
 inline constexpr std::size_t kSubsetPercents = 32;
 /// How many bytes of attributes such declarations may give to all elements together, at most.
 inline constexpr std::size_t kDefaultAttributeBytes = 8U << 20;
-/// How many bytes the entities in one attribute may come to.
-inline constexpr std::size_t kAttributeBytes = 65536;
+/// How many bytes the entities in all attributes may come to.
+inline constexpr std::size_t kEntityBytes = 262144;
 /// How many bytes of XML the elements of a document may get, one within the other, for each byte of
 /// the document, and how many at least.
 inline constexpr std::size_t kRawXMLFactor = 16;
 inline constexpr std::size_t kRawXMLBytes = 1U << 20;
-/// How many entries a document may have, and an entry enclosures.
-inline constexpr std::size_t kEntries = 20000;
+/// How many entries a document may have, an entry enclosures, and a page statements of its base.
+inline constexpr std::size_t kEntries = 10000;
 inline constexpr std::size_t kEnclosures = 1000;
+inline constexpr int kPageBases = 100;
+/// The longest URL that others count as relative to, in bytes: each of them becomes that long.
+inline constexpr std::size_t kBaseURLBytes = 2048;
 /// How long the processor may work on parsing a document, in seconds: as such, and for each MiB.
 inline constexpr double kParseSeconds = 0.5;
 inline constexpr double kParseSecondsPerMiB = 0.25;

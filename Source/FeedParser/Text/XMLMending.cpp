@@ -32,6 +32,8 @@ constexpr std::string_view kEndedByNext[] = {"dd", "dt", "li", "option", "p", "t
 /// What ends there even if something else is still open in it.
 constexpr std::string_view kEntries[] = {"entry", "item"};
 
+constexpr std::string_view kMadeUp = "urn:x-orvane:prefix:";
+
 struct Known {
     std::string_view prefix;
     const char* uri;
@@ -108,7 +110,11 @@ std::string XMLMending::getNamespace(std::string_view prefix) {
     for (const Known& known : kKnown) {
         if (known.prefix == lower) return known.uri;
     }
-    return "urn:x-orvane:prefix:" + std::string(prefix);
+    return std::string(kMadeUp).append(prefix);
+}
+
+bool XMLMending::isMadeUpNamespace(std::string_view uri) {
+    return uri.starts_with(kMadeUp);
 }
 
 std::string XMLMending::mend(std::string_view markup) {

@@ -40,6 +40,8 @@ class XMLMending : Foundation::Uncopyable {
 
     /// The namespace that is meant by a prefix that is not declared.
     static std::string getNamespace(std::string_view prefix);
+    /// Whether a namespace is one that nobody knows, made up for such a prefix.
+    static bool isMadeUpNamespace(std::string_view uri);
 
  private:
     /// An element that has begun and not ended.
