@@ -76,8 +76,13 @@ Ref<Data> bytesOf(int feed) {
     return Data::adopt(xml + "</channel></rss>");
 }
 
+/// The same, parsed.
 FeedCore* documentOf(int feed) {
-    return makeDocument(urlOf(feed).c_str(), postsOf(feed));
+    const Ref<URL> url = URL::url(String::string(urlOf(feed)));
+    const Ref<Data> bytes = bytesOf(feed);
+    FeedCore* parsed = FeedParser::ParserPort().parseFeed(bytes, url);
+    parsed->mURL.setValue(url);
+    return parsed;
 }
 
 void require(bool condition, const char* what) {

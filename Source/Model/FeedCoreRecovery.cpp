@@ -123,6 +123,8 @@ bool FeedCore::recoverEntry(Foundation::URL* url, Data* data) {
     const Ref<EntryCore> entry = known.get() ? known : parsed;
     try {
         if (!known.get()) {
+            // Before it has a feed, whose unread entries would be counted for each.
+            entry->setRead(true);
             if (!adoptRecovered(entry, identifier)) return false;
         } else {
             if (!known->getFeed()) known->setFeed(this);
