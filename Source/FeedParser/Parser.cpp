@@ -101,6 +101,10 @@ bool Parser::mayTryAgain() const {
     return mAttempt != kAttempts && !mIsOverBudget;
 }
 
+bool Parser::isLastAttempt() const {
+    return mAttempt == kAttempts - 1;
+}
+
 void Parser::attemptParse() {
     gLogParser.log("Beginning attempt #%i", mAttempt + 1);
     if (mAttempt == kTidyingAttempt && !tidyDocument()) return;

@@ -66,6 +66,7 @@ class Parser : Foundation::Uncopyable {
     void clearAttempt();
     bool openReader(Attempt& attempt);
     bool mayTryAgain() const;
+    bool isLastAttempt() const;
     void readDocument();
     void learnFromFirstAttempt();
     void unwind();

@@ -170,8 +170,10 @@ bool Parser::readXML(Context* context, bool outer) {
     const std::int32_t errorsBefore = mErrorCount;
     // Reads up to the element's end, all of the document for a feed: an error on the way, however
     // slight, makes the attempt fail, so that imperfect documents are repaired.
+    // The last attempt takes what libxml2 can recover from: nothing would be left to repair it.
     const xmlNodePtr element = xmlTextReaderExpand(mReader);
-    if (element && mErrorCount == errorsBefore && keepXML(element, context, outer)) return true;
+    const bool isGood = mErrorCount == errorsBefore || (isLastAttempt() && !mFatalError);
+    if (element && isGood && keepXML(element, context, outer)) return true;
     gLogParser.log("Fatal error: xmlTextReaderReadOuter/InnerXml failed");
     mFatalError = true;
     return false;

@@ -173,6 +173,20 @@ TEST_F(ParserTest, MatchesNoForeignNamesWithoutAPrefixOtherwise) {
     EXPECT_EQ(found["attempts"], 1);
 }
 
+class Recovery : public ParserTest, public testing::WithParamInterface<const char*> {};
+
+TEST_P(Recovery, ReadsWhatNoRepairTakesAway) {
+    const json found = parsed(
+        rss("<title>A</title>" + padding() + "<item>" + GetParam() + "<title>B</title></item>"));
+    EXPECT_EQ(found["kind"], "feed");
+    EXPECT_EQ(found["feed"]["title"], "A");
+    EXPECT_EQ(valueAt(found, "entries[0].title"), "B");
+}
+INSTANTIATE_TEST_SUITE_P(All, Recovery,
+                         testing::Values("<x xml:id=\"a\"/><x xml:id=\"a\"/>", "<x xml:id=\"1\"/>",
+                                         "<x xml:space=\"other\"/>", "<x xmlns:a=\"no uri\"/>",
+                                         "<a:b:c xmlns:a=\"urn:a\"/>", "<x a:b=\"c\"/>"));
+
 TEST_F(ParserTest, WarnsOfAnEndTagWithoutItsElementAndGoesOn) {
     // The text of the outer title ends at the first end of a title.
     const json found =
