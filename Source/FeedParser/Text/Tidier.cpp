@@ -63,7 +63,7 @@ bool Tidier::setupTidyOptions() {
 }
 
 bool Tidier::open() {
-    if (mDoc) return true;
+    if (mDoc && !mDoc->isWornOut()) return true;
     mDoc = TidyDocument::create();
     if (!mDoc) return false;
     if (setupTidyOptions()) return true;

@@ -5,6 +5,8 @@
 #include <tidy/tidy.h>
 #include <tidy/tidybuffio.h>
 
+#include <utility>
+
 namespace Orvane::FeedParser {
 
 namespace {
@@ -51,19 +53,21 @@ struct TidyDocument::Buffers {
 };
 
 std::unique_ptr<TidyDocument> TidyDocument::create() {
-    const TidyDoc document = tidyCreate();
-    return document ? std::unique_ptr<TidyDocument>(new TidyDocument(document)) : nullptr;
+    std::unique_ptr<TidyDocument> document(new TidyDocument);
+    return document->mDocument ? std::move(document) : nullptr;
 }
 
-TidyDocument::TidyDocument(const _TidyDoc* document)
-    : mDocument(document), mBuffers(std::make_unique<Buffers>()) {
+TidyDocument::TidyDocument()
+    : mDocument(tidyCreateWithAllocator(mMemory.getAllocator())),
+      mBuffers(std::make_unique<Buffers>()) {
+    if (!mDocument) return;
     tidySetAppData(mDocument, this);
     tidySetReportFilter(mDocument, filterReport);
     tidySetErrorBuffer(mDocument, mBuffers->messages.get());
 }
 
 TidyDocument::~TidyDocument() {
-    tidyRelease(mDocument);
+    if (mDocument) tidyRelease(mDocument);
 }
 
 bool TidyDocument::set(const char* option, const char* value) {
@@ -81,6 +85,7 @@ bool TidyDocument::countReport() {
 }
 
 int TidyDocument::repair(std::string_view input, const char* encoding) {
+    ++mRepairs;
     mReports = 0;
     mIsCut = false;
     TidyBuffer* messages = mBuffers->messages.get();

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "FeedParser/Text/TidyMemory.h"
 #include "Foundation/Uncopyable.h"
 
 #include <memory>
@@ -28,16 +29,22 @@ class TidyDocument : Foundation::Uncopyable {
     std::string getMessages() const;
     /// Whether it was cut.
     bool hasCutMessages() const { return mIsCut; }
+    /// Whether it has served long enough: what Tidy forgets to free of each markup stays with it.
+    bool isWornOut() const { return mRepairs >= kRepairs; }
 
     /// For Tidy: whether one more message is to be written.
     bool countReport();
 
  private:
     struct Buffers;
-    explicit TidyDocument(const _TidyDoc* document);
+    static constexpr int kRepairs = 100;
 
+    TidyDocument();
+
+    TidyMemory mMemory;
     const _TidyDoc* mDocument;
     std::unique_ptr<Buffers> mBuffers;
+    int mRepairs = 0;
     int mReports = 0;
     bool mIsCut = false;
 };
