@@ -37,8 +37,11 @@ TidyMemory::TidyMemory() {
 }
 
 TidyMemory::~TidyMemory() {
-    while (mBlocks) {
-        free(getAllocator(), mBlocks->content());
+    Block* block = mBlocks;
+    while (block) {
+        Block* const next = block->next;
+        std::free(block);
+        block = next;
     }
     delete mAllocator;
 }
