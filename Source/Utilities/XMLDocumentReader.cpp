@@ -13,6 +13,8 @@
 
 #include <memory>
 #include <new>
+#include <set>
+#include <string>
 
 namespace Orvane {
 
@@ -115,25 +117,39 @@ void mendContent(xmlNode* node) {
     if (allowed != content) xmlNodeSetContent(node, xmlChars(allowed));
 }
 
+/// Whether a name can be read where namespaces are known: it has one colon at most.
 bool isName(const xmlChar* name) {
-    return xmlValidateName(name, 0) == 0;
+    return xmlValidateQName(name, 0) == 0;
 }
 
-/// Gives an element a name that XML has, and leaves it only attributes of such names and with
-/// values that XML can hold.
-void mendElement(xmlNode* element) {
-    if (!isName(element->name)) {
-        const std::string name = "_" + std::string(xmlView(element->name));
-        xmlNodeSetName(element, xmlChars(isName(xmlChars(name)) ? name : "_"));
-    }
+std::string writtenName(const xmlAttr* attribute) {
+    const std::string name(xmlView(attribute->name));
+    if (!attribute->ns || !attribute->ns->prefix) return name;
+    return std::string(xmlView(attribute->ns->prefix)) + ":" + name;
+}
+
+/// Leaves an element only attributes of names that XML has, each name once, and with values that
+/// XML can hold.
+void mendAttributes(xmlNode* element) {
+    std::set<std::string> names;
     for (xmlAttr* attribute = element->properties; attribute;) {
         xmlAttr* next = attribute->next;
         for (xmlNode* text = attribute->children; text; text = text->next) {
             mendContent(text);
         }
-        if (!isName(attribute->name)) xmlRemoveProp(attribute);
+        const bool once = names.insert(writtenName(attribute)).second;
+        if (!once || !isName(attribute->name)) xmlRemoveProp(attribute);
         attribute = next;
     }
+}
+
+/// Gives an element a name that XML has, and such attributes.
+void mendElement(xmlNode* element) {
+    if (!isName(element->name)) {
+        const std::string name = "_" + std::string(xmlView(element->name));
+        xmlNodeSetName(element, xmlChars(isName(xmlChars(name)) ? name : "_"));
+    }
+    mendAttributes(element);
 }
 
 /// Takes what is no XML out of a tree that a tolerant parser made: HTML has comments, names and

@@ -5,6 +5,7 @@
 #include "Utilities/XMLDocumentReader.h"
 #include "Utilities/XMLElement.h"
 
+#include <cstdio>
 #include <cstdlib>
 
 using namespace Foundation;
@@ -28,6 +29,10 @@ void check(const XMLElement* element) {
     const Ref<Data> written = element->ov_asData();
     std::string error;
     const Ref<XMLTree> again = readXMLDocument(written->view(), XMLTolerance::None, error);
+    if (!again) {
+        std::fprintf(stderr, "%s: %.*s\n", error.c_str(), static_cast<int>(written->view().size()),
+                     written->view().data());
+    }
     require(again.get() != nullptr);
     const Ref<String> document = element->ov_asDocumentString();
     const Ref<String> text = element->getStringValue();

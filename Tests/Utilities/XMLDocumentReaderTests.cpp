@@ -108,6 +108,16 @@ TEST(XMLDocumentReader, LeavesNothingThatCouldNotBeReadAgain) {
               "<html xmlns=\"http://www.w3.org/1999/xhtml\"><body><p>x</p></body></html>");
     EXPECT_EQ(read("<p .x='1' y='2'>\x02</p>", XMLTolerance::HTML),
               "<html xmlns=\"http://www.w3.org/1999/xhtml\"><body><p y=\"2\"/></body></html>");
+    EXPECT_EQ(
+        read("<p a:b='1' a:b:02c='2'>x</p>", XMLTolerance::HTML),
+        "<html xmlns=\"http://www.w3.org/1999/xhtml\"><body><p a:b=\"1\">x</p></body></html>");
+}
+
+TEST(XMLDocumentReader, LeavesEachAttributeOnce) {
+    EXPECT_EQ(read("<a><p:b c='&amp;x;' c='&amp;x;' d='1'>x</b></a>", XMLTolerance::XML),
+              "<a><p:b c=\"&amp;x;\" d=\"1\">x</p:b></a>");
+    EXPECT_EQ(read("<a xmlns:p='u' c='1' p:c='2'>x", XMLTolerance::XML),
+              "<a xmlns:p=\"u\" c=\"1\" p:c=\"2\">x</a>");
 }
 
 TEST(XMLDocumentReader, ReplacesTheDocumentsOwnEntities) {
