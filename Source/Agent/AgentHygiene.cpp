@@ -1,0 +1,9 @@
+#include "Agent/AgentTask.h"
+
+namespace Orvane {
+
+void AgentTask::scheduleHygieneTasks() {}
+
+void AgentTask::hygieneTasks() {}
+
+}  // namespace Orvane

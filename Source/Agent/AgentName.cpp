@@ -1,0 +1,34 @@
+#include "Agent/AgentName.h"
+
+#include "Foundation/Bus.h"
+#include "Foundation/BusCenter.h"
+#include "Foundation/Clock.h"
+#include "Foundation/Logger.h"
+#include "Foundation/RunLoop.h"
+
+namespace Orvane {
+
+using namespace Foundation;
+
+AgentName::Claim AgentName::claim() {
+    Bus& bus = Bus::user();
+    if (bus.requestName(BusCenter::kAgentName)) return Claim::kOurs;
+    if (bus.isConnected() && !bus.getNameOwner(BusCenter::kAgentName).empty()) {
+        return Claim::kTaken;
+    }
+    return Claim::kNoBus;
+}
+
+void AgentName::giveUp() {
+    Bus& bus = Bus::user();
+    if (!bus.isConnected()) return;
+    // The answer comes behind all calls that the bus has sent to the name.
+    bus.releaseName(BusCenter::kAgentName);
+    RunLoop& loop = RunLoop::current();
+    const double end = Clock::current().now() + kServeSeconds;
+    while (loop.turn() && Clock::current().now() < end) {
+    }
+    bus.flush(kServeSeconds);
+}
+
+}  // namespace Orvane

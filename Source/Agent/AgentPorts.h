@@ -1,0 +1,18 @@
+#pragma once
+
+#include "FeedParser/ParserPort.h"
+#include "Foundation/Uncopyable.h"
+
+namespace Orvane {
+
+/// What the model asks of higher layers, connected for the agent's process while this lives.
+class AgentPorts : Foundation::Uncopyable {
+ public:
+    AgentPorts();
+    ~AgentPorts();
+
+ private:
+    FeedParser::ParserPort mParser;
+};
+
+}  // namespace Orvane

@@ -1,0 +1,74 @@
+#include "Agent/OVAgentFrameworkMain.h"
+
+#include "Agent/AgentName.h"
+#include "Agent/AgentPorts.h"
+#include "Agent/AgentTask.h"
+#include "Agent/LaunchListener.h"
+#include "Foundation/ApplicationIdentity.h"
+#include "Foundation/AutoreleasePool.h"
+#include "Foundation/BusCenter.h"
+#include "Foundation/Logger.h"
+#include "Foundation/RunLoop.h"
+
+#include <csignal>
+
+using namespace Foundation;
+
+namespace Orvane {
+
+namespace {
+
+constexpr const char* kIdentifier = "com.tarnwick.Orvane.Agent";
+
+/// Whether this process is to be the agent.
+bool isAgent() {
+    const AgentName::Claim claim = AgentName::claim();
+    if (claim == AgentName::Claim::kTaken) {
+        gLog.log("Another process owns %s: leaving it the work", BusCenter::kAgentName);
+        return false;
+    }
+    if (claim == AgentName::Claim::kNoBus) {
+        gWarn.log("No message bus: the agent goes on, but nobody can call it");
+    }
+    return true;
+}
+
+/// Whether there is anything to be run.
+bool setUp(AgentTask& task) {
+    const AutoreleasePool pool;
+    gLog.log("----- Orvane Agent STARTING -----");
+    LaunchListener::instance()->registerSignal(SIGTERM);
+    std::signal(SIGPIPE, SIG_IGN);
+    // First of all that touches the database: there are never two who write to it.
+    if (!isAgent()) return false;
+    task.start(true);
+    gLog.log("Orvane Agent finished setup; starting runloop");
+    return true;
+}
+
+void run() {
+    const AgentPorts ports;
+    AgentTask task;
+    if (!setUp(task)) return;
+    RunLoop::current().run();
+    gLog.log("Orvane Agent exited runloop");
+    AgentName::giveUp();
+}
+
+}  // namespace
+
+}  // namespace Orvane
+
+int OVAgentFrameworkMain() {
+    using namespace Orvane;
+    int status = 0;
+    try {
+        ApplicationIdentity::setIdentifier(kIdentifier);
+        run();
+    } catch (...) {
+        warnAboutCurrentException("int OVAgentFrameworkMain()");
+        status = 1;
+    }
+    gLog.log("----- Orvane Agent EXITING with status %i -----\n\n", status);
+    return status;
+}
