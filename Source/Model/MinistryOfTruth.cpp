@@ -86,6 +86,23 @@ void migrate(int minor) {
              Clock::current().now() - start);
 }
 
+/// Drops what somebody's ANALYZE has left. The planner believes it, and walks a table that has
+/// grown since instead of using its index. Where there is no room for that it does without.
+void forgetStatistics() {
+    try {
+        const int tables = gDatabase->execScalar(
+            "SELECT count(*) FROM sqlite_master WHERE name IN ('sqlite_stat1', 'sqlite_stat4')");
+        if (tables == 0) return;
+        gLogAgent.log("Dropping the statistics of the database");
+        gDatabase->execute("DROP TABLE IF EXISTS sqlite_stat1; DROP TABLE IF EXISTS sqlite_stat4");
+        // The connection has read them with the schema, and now reads that anew.
+        gDatabase->execute("PRAGMA writable_schema = RESET");
+    } catch (const SQLite::Exception& exception) {
+        if (exception.isFatal()) throw;
+        doWarnAboutException(&exception, "void Orvane::forgetStatistics()");
+    }
+}
+
 /// True while it lives.
 class Flag : Uncopyable {
  public:
@@ -130,6 +147,7 @@ void MinistryOfTruth::openExistingDatabase() {
         if (checkDatabaseSchema()) {
             // Not before: it fixes the mode of auto_vacuum.
             gDatabase->useWriteAheadLog();
+            forgetStatistics();
         } else {
             reason = String::string("Database schema way out of date");
         }

@@ -183,6 +183,25 @@ TEST_F(DatabaseLifeTest, OpensOneThatIsUpToDate) {
     EXPECT_EQ(postNames(), Strings{});
 }
 
+TEST_F(DatabaseLifeTest, DropsStatisticsAndPlansWithoutThem) {
+    const auto plan = [] {
+        return rows("explain query plan select * from Subscriptions where feed=1");
+    };
+    start();
+    const Strings before = plan();
+    EXPECT_THAT(before[0], HasSubstr("USING INDEX Subscriptions_feedandclient (feed=?)"));
+    db().execute("insert into Clients (signature) values ('a')");
+    db().execute("insert into Subscriptions (client, feed) values (1, 1)");
+    db().execute("analyze");
+    EXPECT_NE(plan(), before);
+    restart();
+    EXPECT_EQ(plan(), before);
+    EXPECT_EQ(count("sqlite_master where name like 'sqlite_stat%'"), 0);
+    EXPECT_TRUE(log.contains("Dropping the statistics of the database"));
+    restart();
+    EXPECT_FALSE(log.contains("Dropping the statistics"));
+}
+
 TEST_F(DatabaseLifeTest, SavesTheClientsOfOneThatHasNoFileOfThem) {
     makeCurrent();
     start();
