@@ -1,6 +1,7 @@
 #include "Model/ClientCore.h"
 
 #include "Foundation/AssertionFailure.h"
+#include "Foundation/ClockTrust.h"
 #include "Foundation/Date.h"
 #include "Foundation/Logger.h"
 #include "Foundation/NotificationCenter.h"
@@ -119,7 +120,9 @@ ClientCore::~ClientCore() {
 void ClientCore::markInUse() {
     const Date* used = mDateUsed;
     const double age = Date::getTimeAgo(used);
-    if (used && age < (isChangeable() ? kNoteUseSeconds : kReportUseSeconds)) return;
+    // One of the future would stay until then.
+    const bool isFresh = used && !Foundation::ClockTrust::isFromWrongClock(used);
+    if (isFresh && age < (isChangeable() ? kNoteUseSeconds : kReportUseSeconds)) return;
     if (!isChangeable()) {
         AgentLink::current().markClientInUse(this);
         mDateUsed.unload();
@@ -147,6 +150,7 @@ bool ClientCore::isProcessRunning() const {
 
 bool ClientCore::isDormant() const {
     const Date* used = mDateUsed;
+    // That a wrong clock has left a date of the future is no reason to leave the feeds alone.
     return !used || used->getTimeAgo() >= kDormantSeconds;
 }
 

@@ -66,7 +66,7 @@ class FeedCore : public FeedColumns {
     /// The shortest interval of the subscriptions in seconds, at least the minimum;
     /// `kRefreshNever` if there is none.
     double getRefreshInterval() const;
-    /// Null if it is never due.
+    /// Null if it is never due. Now if it has not been refreshed, or more than a day in the future.
     Foundation::Returner<Foundation::Date> getNextRefreshDate() const;
     /// The feed's own, made on first use; null if feeders cannot be made.
     FeedRefresher* getFeeder();

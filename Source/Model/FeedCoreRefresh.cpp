@@ -1,4 +1,5 @@
 #include "Foundation/AssertionFailure.h"
+#include "Foundation/ClockTrust.h"
 #include "Foundation/Date.h"
 #include "Foundation/DictionaryOf.h"
 #include "Foundation/Logger.h"
@@ -56,7 +57,9 @@ Foundation::DateReturner FeedCore::getNextRefreshDate() const {
     const double interval = getRefreshInterval();
     if (interval == kRefreshNever) return nullptr;
     const Date* last = mRefreshLocalDate.getValue();
-    return last ? last->addTime(interval) : Date::now();
+    // One that a wrong clock has left would keep the feed waiting until then.
+    if (!last || Foundation::ClockTrust::isFromWrongClock(last)) return Date::now();
+    return last->addTime(interval);
 }
 
 void FeedCore::setReceivers(FeedRefresher& feeder, FeedCore* feed) {

@@ -98,6 +98,17 @@ TEST_P(ClientUseTest, IsNotedAsSeldomAsWillDo) {
     EXPECT_EQ(agent.calls, use.isAsked ? "markClientInUse(1) " : "");
 }
 
+TEST_F(ClientCoreTest, IsNotDormantByADateOfTheFutureAndDoesNotKeepIt) {
+    const Ref<ClientCore> client = newClient();
+    client->mDateUsed.setValue(date(clock.now() + kDay));
+    client->markInUse();
+    EXPECT_EQ(time(client->mDateUsed), clock.now() + kDay);
+    client->mDateUsed.setValue(date(clock.now() + 1000 * kDay));
+    EXPECT_FALSE(client->isDormant());
+    client->markInUse();
+    EXPECT_EQ(time(client->mDateUsed), clock.now());
+}
+
 INSTANTIATE_TEST_SUITE_P(
     Ages, ClientUseTest,
     testing::Values(Use{0, false, false, false}, Use{3599, false, false, false},

@@ -92,6 +92,15 @@ TEST_F(FeedCoreRefresh, IsDueAnIntervalAfterTheLastRefreshOrNow) {
     EXPECT_EQ(feed->getNextRefreshDate()->getAbsoluteTime(), clock.now() + 200);
 }
 
+TEST_F(FeedCoreRefresh, TakesADateOfAWrongClockForNone) {
+    FeedCore* feed = storedFeed();
+    subscribe(storedClient("a"), feed, 300);
+    feed->mRefreshLocalDate.setValue(date(clock.now() + 86400));
+    EXPECT_EQ(feed->getNextRefreshDate()->getAbsoluteTime(), clock.now() + 86400 + 300);
+    feed->mRefreshLocalDate.setValue(date(clock.now() + 86401));
+    EXPECT_EQ(feed->getNextRefreshDate()->getAbsoluteTime(), clock.now());
+}
+
 TEST_F(FeedCoreRefresh, MakesItsFeederOnceAndAsksIt) {
     FeedCore* feed = storedFeed();
     EXPECT_FALSE(feed->needsRefresh());
