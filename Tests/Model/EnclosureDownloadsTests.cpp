@@ -196,9 +196,9 @@ TEST_F(EnclosureDownloadsTest, NotesThatItsFileIsGone) {
 
 TEST_F(EnclosureDownloadsTest, KeepsItsError) {
     EXPECT_EQ(row->getDownloadError(), NetError::None);
-    row->setDownloadError({1206, 404});
-    EXPECT_EQ(row->getDownloadError(), NetError(1206, 404));
-    EXPECT_EQ(row->mDownloadErrorDomain, 1206);
+    row->setDownloadError({NetError::kHTTP, 404});
+    EXPECT_EQ(row->getDownloadError(), NetError(NetError::kHTTP, 404));
+    EXPECT_EQ(row->mDownloadErrorDomain, NetError::kHTTP);
     EXPECT_EQ(row->mDownloadErrorCode, 404);
 }
 

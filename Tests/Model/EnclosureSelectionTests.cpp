@@ -88,7 +88,7 @@ TEST_F(EnclosureSelectionTest, SkipsWhatTheUserCancelledAndRetriesOtherFailuresO
     failed->setDownloadError({15, -1001});
     const Ref<EnclosureCore> other = approved("http://e.org/c");
     other->mDownloadState.setValue(EnclosureCore::kFailed);
-    other->setDownloadError({1206, -999});
+    other->setDownloadError({NetError::kHTTP, -999});
     db().saveRows();
     EXPECT_EQ(start(), "make(2) start make(3) start ");
     EXPECT_EQ(start(), "");

@@ -166,7 +166,7 @@ TEST_F(FeedCoreRefresh, AnnouncesWhatItsFeederDoes) {
               "FeedBeganUpdate \n"
               "FeedEndedUpdate {}\n"
               "FeedEndedUpdate {DidChange = 1}\n"
-              "FeedEndedUpdate {ErrorDomain = 1206, ErrorCode = 404}\n");
+              "FeedEndedUpdate {ErrorDomain = 4, ErrorCode = 404}\n");
     const std::string name = text(feed->toString());
     EXPECT_EQ(log.count("Started refresh of " + name), 1);
     EXPECT_EQ(log.count("Started actual HTTP fetch of " + name), 1);
@@ -190,7 +190,7 @@ TEST_F(FeedCoreRefresh, KeepsTheLastErrorInItsColumns) {
     EXPECT_EQ(feed->getLastError(), NetError::None);
     feed->setLastError({NetError::kHTTP, 404});
     feed->saveChanges();
-    EXPECT_EQ(count("Feeds where lastErrorDomain=1206 and lastErrorCode=404"), 1);
+    EXPECT_EQ(count("Feeds where lastErrorDomain=4 and lastErrorCode=404"), 1);
     EXPECT_EQ(feed->getLastError(), NetError(NetError::kHTTP, 404));
 }
 
