@@ -14,26 +14,41 @@ using Foundation::Ref;
 
 namespace {
 
-auto find(std::vector<Ref<Row>>& rows, const Row* row) {
+constexpr std::size_t kMany = 32;
+
+auto find(const std::vector<Ref<Row>>& rows, const Row* row) {
     return std::find_if(rows.begin(), rows.end(),
                         [&](const Ref<Row>& item) { return item.get() == row; });
 }
 
 }  // namespace
 
+bool BasicToManyColumn::has(const Row* row) const {
+    return mIndex ? mIndex->contains(row) : find(mNewRows, row) != mNewRows.end();
+}
+
+void BasicToManyColumn::makeIndexIfMany() {
+    if (mIndex || mNewRows.size() < kMany) return;
+    mIndex = std::make_unique<Index>();
+    for (const Ref<Row>& row : mNewRows) {
+        mIndex->insert(row.get());
+    }
+}
+
 void BasicToManyColumn::add(Row* row) {
-    if (find(mNewRows, row) == mNewRows.end()) mNewRows.emplace_back(row);
+    if (has(row)) return;
+    makeIndexIfMany();
+    if (mIndex) mIndex->insert(row);
+    mNewRows.emplace_back(row);
 }
 
 bool BasicToManyColumn::remove(Row* row) {
-    const auto found = find(mNewRows, row);
-    if (found == mNewRows.end()) return false;
-    std::vector<Ref<Row>> kept;
-    for (Ref<Row>& item : mNewRows) {
-        if (item.get() != row) kept.push_back(std::move(item));
-    }
+    if (!has(row)) return false;
+    const auto place = mNewRows.begin() + (find(mNewRows, row) - mNewRows.cbegin());
     // What goes is released at once, when this is in order again.
-    mNewRows.swap(kept);
+    const Ref<Row> leaving = std::move(*place);
+    mNewRows.erase(place);
+    if (mIndex) mIndex->erase(row);
     return true;
 }
 
@@ -57,17 +72,22 @@ void BasicToManyColumn::saveChanges(Table* destination) {
     }
     std::vector<Ref<Row>> done;
     done.swap(mNewRows);
+    mIndex.reset();
 }
 
 void BasicToManyColumn::_restore(const std::vector<Ref<Row>>& rows) {
     std::vector<Ref<Row>> restored;
     for (const Ref<Row>& row : rows) {
-        if (row->getRowID() == 0 && row->getTable()) restored.push_back(row);
+        if (row->getRowID() != 0 || !row->getTable()) continue;
+        remove(row.get());
+        restored.push_back(row);
     }
-    for (const Ref<Row>& row : mNewRows) {
-        if (find(restored, row.get()) == restored.end()) restored.push_back(row);
+    mNewRows.insert(mNewRows.begin(), restored.begin(), restored.end());
+    makeIndexIfMany();
+    if (!mIndex) return;
+    for (const Ref<Row>& row : restored) {
+        mIndex->insert(row.get());
     }
-    mNewRows.swap(restored);
 }
 
 }  // namespace SQLite

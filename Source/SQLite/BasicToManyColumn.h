@@ -5,6 +5,8 @@
 #include "SQLite/ColumnList.h"
 #include "SQLite/Row.h"
 
+#include <memory>
+#include <unordered_set>
 #include <vector>
 
 namespace SQLite {
@@ -16,7 +18,7 @@ class BasicToManyColumn : public Column {
     /// `foreignKey` is the column of the other table; it must outlive this.
     BasicToManyColumn(Row* row, const char* foreignKey) : Column(row), mForeignKey(foreignKey) {}
 
-    /// Adds a row, once.
+    /// Adds a row behind the others, once.
     void add(Row* row);
     /// Whether the row was there.
     bool remove(Row* row);
@@ -28,12 +30,21 @@ class BasicToManyColumn : public Column {
     const char* getForeignKey() const { return mForeignKey; }
     const std::vector<Foundation::Ref<Row>>& getNewRows() const { return mNewRows; }
 
-    /// For the journal: takes those of the rows back that are new again.
+    /// For the journal: takes those of the rows back that are new again, in front of the others.
     void _restore(const std::vector<Foundation::Ref<Row>>& rows);
 
  protected:
     const char* mForeignKey;
     std::vector<Foundation::Ref<Row>> mNewRows;
+
+ private:
+    using Index = std::unordered_set<const Row*>;
+
+    bool has(const Row* row) const;
+    void makeIndexIfMany();
+
+    /// The rows of `mNewRows`, once there are so many that looking through them takes long.
+    std::unique_ptr<Index> mIndex;
 };
 
 }  // namespace SQLite

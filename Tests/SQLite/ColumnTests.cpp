@@ -4,6 +4,9 @@
 #include "SQLite/UpdateQuery.h"
 #include "Support/DefaultZone.h"
 
+#include <algorithm>
+#include <vector>
+
 using namespace Foundation;
 using namespace SQLite;
 using Support::DefaultZone;
@@ -254,6 +257,54 @@ TEST_F(ToManyColumnTest, KeepsEachNewRowOnceInOrder) {
     EXPECT_EQ(group->mItems.getNewRows().at(0).get(), b.get());
     EXPECT_EQ(group->mItems.getNewRows().at(1).get(), c.get());
     EXPECT_STREQ(group->mItems.getForeignKey(), "owner");
+}
+
+TEST_F(ToManyColumnTest, KeepsThousandsOfRowsAsItKeepsAFew) {
+    constexpr std::size_t kRows = 5000;
+    const Ref<Group> group = Group::make("g");
+    std::vector<Ref<Item>> rows;
+    for (std::size_t i = 0; i < kRows; ++i) {
+        rows.push_back(Item::make("a"));
+    }
+    for (int times = 0; times < 2; ++times) {
+        for (const Ref<Item>& item : rows) {
+            group->mItems.add(item.get());
+        }
+    }
+    ASSERT_EQ(group->mItems.getNewRows().size(), kRows);
+    // One that has gone may come again, as the last.
+    for (const std::size_t gone : {std::size_t{0}, kRows / 2, kRows - 1}) {
+        EXPECT_TRUE(group->mItems.remove(rows[gone].get()));
+        EXPECT_FALSE(group->mItems.remove(rows[gone].get()));
+    }
+    group->mItems.add(rows[0].get());
+    ASSERT_EQ(group->mItems.getNewRows().size(), kRows - 2);
+    EXPECT_EQ(group->mItems.getNewRows().at(0).get(), rows[1].get());
+    EXPECT_EQ(group->mItems.getNewRows().at(kRows / 2 - 1).get(), rows[kRows / 2 + 1].get());
+    EXPECT_EQ(group->mItems.getNewRows().back().get(), rows[0].get());
+    // Down to none, the last first.
+    std::reverse(rows.begin(), rows.end());
+    for (const Ref<Item>& item : rows) {
+        group->mItems.remove(item.get());
+    }
+    EXPECT_TRUE(group->mItems.getNewRows().empty());
+    group->mItems.add(rows[0].get());
+    EXPECT_EQ(group->mItems.getNewRows().size(), 1U);
+}
+
+TEST_F(ToManyColumnTest, ReleasesARowThatGoesAtOnce) {
+    const Ref<Group> group = Group::make("g");
+    Ref<Item> first = Item::make("a");
+    const Ref<Item> second = Item::make("b");
+    group->mItems.add(first.get());
+    group->mItems.add(second.get());
+    const std::uint32_t references = second->getRefCount();
+    {
+        const AutoreleasePool inner;
+        group->mItems.remove(first.get());
+        EXPECT_EQ(first->getRefCount(), 1U);
+    }
+    EXPECT_EQ(second->getRefCount(), references);
 }
 
 TEST_F(ToManyColumnTest, SavesItsRowsBehindTheOwner) {

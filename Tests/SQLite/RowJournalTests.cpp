@@ -5,6 +5,8 @@
 #include "SQLite/Transaction.h"
 
 #include <stdexcept>
+#include <string>
+#include <vector>
 
 using namespace Foundation;
 using namespace SQLite;
@@ -211,6 +213,39 @@ TEST_F(RowJournalTest, ToManyColumnsHaveTheirNewRowsAgain) {
     group->saveChanges();
     EXPECT_EQ(count("owner=1"), 2);
     EXPECT_TRUE(group->mItems.getNewRows().empty());
+}
+
+TEST_F(RowJournalTest, ToManyColumnsHaveThousandsOfRowsAgainInTheirOrder) {
+    constexpr std::size_t kRows = 3000;
+    const Ref<Group> group = Group::make("g");
+    group->saveChanges();
+    std::vector<Ref<Item>> rows;
+    for (std::size_t i = 0; i < kRows; ++i) {
+        const AutoreleasePool inner;
+        rows.push_back(Item::make(std::to_string(i).c_str()));
+        rows.back()->mOwner.setValue(group.get());
+        group->mItems.add(rows.back().get());
+    }
+    rollBack([&] {
+        // All but the last leave one by one, as rows do that are saved by themselves.
+        for (std::size_t i = 0; i + 1 < kRows; ++i) {
+            const AutoreleasePool inner;
+            rows[i]->addToTable(items());
+            rows[i]->saveChanges();
+            group->mItems.removeSaved(rows[i].get());
+        }
+        ASSERT_EQ(group->mItems.getNewRows().size(), 1U);
+    });
+    ASSERT_EQ(group->mItems.getNewRows().size(), kRows);
+    for (std::size_t i = 0; i < kRows; ++i) {
+        ASSERT_EQ(group->mItems.getNewRows()[i].get(), rows[i].get()) << i;
+    }
+    // None is there twice, and each is found.
+    group->mItems.add(rows[0].get());
+    EXPECT_EQ(group->mItems.getNewRows().size(), kRows);
+    EXPECT_TRUE(group->mItems.remove(rows[kRows / 2].get()));
+    group->mItems.saveChanges(items());
+    EXPECT_EQ(count("owner=1"), static_cast<int>(kRows) - 1);
 }
 
 TEST_F(RowJournalTest, ASaveThatFailsHalfWayBringsAllBack) {
