@@ -1,17 +1,13 @@
 #include "FeedParser/Text/RSSAuthorParser.h"
 #include "Foundation/UTF8.h"
+#include "Fuzz/FuzzTarget.h"
 
-#include <cstdlib>
 #include <string>
 
 using namespace Foundation;
 using Orvane::RSSAuthorParser;
 
 namespace {
-
-void require(bool condition) {
-    if (!condition) std::abort();
-}
 
 /// What is found is a text without outer blanks.
 std::size_t lengthOf(const String* found) {

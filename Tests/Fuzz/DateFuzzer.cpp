@@ -1,25 +1,12 @@
-#include "Foundation/Clock.h"
 #include "Foundation/DateParser.h"
+#include "Fuzz/FuzzTarget.h"
+#include "Support/ManualClock.h"
 
-#include <cstdlib>
 #include <string>
 
 using namespace Foundation;
 
 namespace {
-
-/// A clock that stands still, so that an input always does the same.
-class StillClock : public Clock {
- public:
-    double now() const override { return 788918400; }
-    void sleep(double) override {}
-    bool runsByItself() const override { return false; }
-    bool advanceIdle(double) override { return false; }
-};
-
-void require(bool condition) {
-    if (!condition) std::abort();
-}
 
 /// What holds for every date that was read. Of the other parts nothing does: a number that passes
 /// 32 bits may wrap to one below 0, which only the month and the year refuse.
@@ -33,8 +20,7 @@ void checkParts(const GregorianDate& date, std::uint32_t mask, const char* zone)
 }  // namespace
 
 extern "C" int LLVMFuzzerTestOneInput(const unsigned char* bytes, std::size_t size) {
-    static StillClock sClock;
-    Clock::setCurrent(&sClock);
+    static Support::ManualClock sClock;  // so that an input always does the same
     const std::string text(reinterpret_cast<const char*>(bytes), size);
 
     GregorianDate date;

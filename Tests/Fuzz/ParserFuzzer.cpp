@@ -1,14 +1,12 @@
 #include "FeedParser/Parser.h"
 #include "Foundation/AutoreleasePool.h"
-#include "Foundation/Clock.h"
 #include "Foundation/Data.h"
-#include "Foundation/Logger.h"
 #include "Foundation/UTF8.h"
+#include "Fuzz/FuzzTarget.h"
 #include "Model/ContentCore.h"
 #include "Model/EnclosureCore.h"
 #include "SQLite/Database.h"
-
-#include <cstdlib>
+#include "Support/ManualClock.h"
 
 using namespace Foundation;
 using namespace Orvane;
@@ -16,25 +14,6 @@ using FeedParser::Info;
 using FeedParser::Parser;
 
 namespace {
-
-/// A clock that stands still, so that an input always does the same.
-class StillClock : public Clock {
- public:
-    double now() const override { return 788918400; }
-    void sleep(double) override {}
-    bool runsByItself() const override { return false; }
-    bool advanceIdle(double) override { return false; }
-};
-
-/// Most inputs are no feed, which is warned about.
-class NoLog : public LogSink {
- public:
-    void write(const Logger&, std::string_view) override {}
-};
-
-void require(bool condition) {
-    if (!condition) std::abort();
-}
 
 /// Whatever came in, texts of rows are UTF-8: they go into the database and to other programs.
 void check(const String* text) {
@@ -85,10 +64,8 @@ void check(const ArrayOf<HTMLLink>* links) {
 }  // namespace
 
 extern "C" int LLVMFuzzerTestOneInput(const unsigned char* bytes, std::size_t size) {
-    static StillClock sClock;
+    static Support::ManualClock sClock;  // so that an input always does the same
     static NoLog sNoLog;
-    Clock::setCurrent(&sClock);
-    setLogSink(&sNoLog);
     SQLite::Database::initialize();
     const AutoreleasePool pool;
     const Ref<Data> data = Data::data(bytes, size);

@@ -1,19 +1,11 @@
 #include "Foundation/Data.h"
 #include "Foundation/PropertyList.h"
 #include "Foundation/Ref.h"
+#include "Fuzz/FuzzTarget.h"
 
-#include <cstdlib>
 #include <string>
 
 using namespace Foundation;
-
-namespace {
-
-void require(bool condition) {
-    if (!condition) std::abort();
-}
-
-}  // namespace
 
 /// What is read is written, unless that is refused, and then reads as the same.
 extern "C" int LLVMFuzzerTestOneInput(const unsigned char* bytes, std::size_t size) {

@@ -1,8 +1,8 @@
 #include "FeedParser/Text/ParserUtils.h"
 #include "Foundation/AutoreleasePool.h"
 #include "Foundation/UTF8.h"
+#include "Fuzz/FuzzTarget.h"
 
-#include <cstdlib>
 #include <cstring>
 #include <string>
 
@@ -10,10 +10,6 @@ using namespace Foundation;
 using Orvane::ParserUtils;
 
 namespace {
-
-void require(bool condition) {
-    if (!condition) std::abort();
-}
 
 /// What a routine makes of a text, which must be the same elsewhere and in place, and no longer.
 template <class Routine>

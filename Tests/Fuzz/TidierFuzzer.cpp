@@ -5,10 +5,10 @@
 #include "FeedParser/Text/XMLSnippetTidier.h"
 #include "Foundation/AutoreleasePool.h"
 #include "Foundation/Ref.h"
+#include "Fuzz/FuzzTarget.h"
 
 #include <libxml/parser.h>
 
-#include <cstdlib>
 #include <iterator>
 #include <string>
 
@@ -16,10 +16,6 @@ using namespace Foundation;
 using namespace Orvane::FeedParser;
 
 namespace {
-
-void require(bool condition) {
-    if (!condition) std::abort();
-}
 
 bool isWellFormed(const std::string& xml) {
     xmlDoc* document = xmlReadMemory(xml.data(), static_cast<int>(xml.size()), nullptr, nullptr,

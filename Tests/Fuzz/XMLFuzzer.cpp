@@ -1,27 +1,16 @@
 #include "Foundation/AutoreleasePool.h"
 #include "Foundation/Data.h"
-#include "Foundation/Logger.h"
 #include "Foundation/UTF8.h"
+#include "Fuzz/FuzzTarget.h"
 #include "Utilities/XMLDocumentReader.h"
 #include "Utilities/XMLElement.h"
 
 #include <cstdio>
-#include <cstdlib>
 
 using namespace Foundation;
 using namespace Orvane;
 
 namespace {
-
-void require(bool condition) {
-    if (!condition) std::abort();
-}
-
-/// Most inputs are no XML, which is warned about.
-class NoLog : public LogSink {
- public:
-    void write(const Logger&, std::string_view) override {}
-};
 
 /// Whatever was read is written so that it can be read, and its children can be taken out.
 void check(const XMLElement* element) {
@@ -48,7 +37,6 @@ void check(const XMLElement* element) {
 
 extern "C" int LLVMFuzzerTestOneInput(const unsigned char* bytes, std::size_t size) {
     static NoLog sNoLog;
-    setLogSink(&sNoLog);
     const AutoreleasePool pool;
     const Ref<Data> data = Data::data(bytes, size);
     check(Ref<XMLElement>(XMLElement::ov_elementWithData(data, false)).get());
