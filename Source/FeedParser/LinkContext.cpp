@@ -1,10 +1,22 @@
 #include "FeedParser/LinkContext.h"
 
+#include "FeedParser/Text/XMLCharacters.h"
+
 namespace Orvane::FeedParser {
 
 using Foundation::Ref;
 using Foundation::String;
 using Foundation::URL;
+
+namespace {
+
+/// The number at the start of the text, which has no sign; 0 if there is none.
+long long leadingDigits(const String& text) {
+    const bool isDigit = !text.utf8().empty() && XMLCharacters::isDigit(text.utf8().front());
+    return isDigit ? text.toLongLong() : 0;
+}
+
+}  // namespace
 
 LinkContext::LinkContext(Tag theTag)
     : PlainTextContext(theTag),
@@ -34,7 +46,7 @@ void LinkContext::gotAttribute(const char* prefix, const char* name, const char*
             break;
         case SizeTag:
         case LengthTag:
-            enclosure->mLength.setValue(wanted->toLongLong());
+            enclosure->mLength.setValue(leadingDigits(*wanted));
             break;
         default:
             break;

@@ -5,6 +5,9 @@
 
 #include <gtest/gtest.h>
 
+#include <limits>
+#include <utility>
+
 using namespace Foundation;
 using namespace Orvane::FeedParser;
 
@@ -24,6 +27,21 @@ TEST_F(LinkContextTest, TakesValuesWithoutOuterWhiteSpace) {
     context->gotAttribute(nullptr, "length", " 12 ");
     EXPECT_EQ(context->link->mHref->utf8(), "x");
     EXPECT_EQ(context->enclosure->mLength.getValue(), 12);
+}
+
+TEST_F(LinkContextTest, TakesTheDigitsThatALengthBeginsWith) {
+    const std::pair<const char*, long long> lengths[] = {
+        {"12", 12},   {" 12 bytes", 12},
+        {"007", 7},   {"1.5", 1},
+        {"-5", 0},    {"+5", 0},
+        {"- 5", 0},   {"x5", 0},
+        {"0x10", 0},  {" ", 0},
+        {"1,024", 1}, {"99999999999999999999", std::numeric_limits<long long>::max()}};
+    for (const auto& [text, length] : lengths) {
+        context->gotAttribute(nullptr, "length", "77");
+        context->gotAttribute(nullptr, "size", text);
+        EXPECT_EQ(context->enclosure->mLength.getValue(), length) << text;
+    }
 }
 
 TEST_F(LinkContextTest, IgnoresValuesThatAreNoUTF8) {
