@@ -83,6 +83,11 @@ DataReturner Tidier::tidy(Data* data, int encoding, URL* baseURL) {
     TidyResult result =
         mayTidyHere(bytes) ? tidyHere(bytes, encoding, baseURL)
                            : TidyHelper::getShared().tidy(getClassName(), bytes, encoding, baseURL);
+    if (result.code == TidyResult::kNothing) {
+        gLogParser.log("Not tidied (%u bytes, encoding=%i, baseURL=%@): %s",
+                       static_cast<unsigned>(bytes.size()), encoding, baseURL, result.messages);
+        return nullptr;
+    }
     if (!result.isSuccess()) {
         gLogParser.log("Tidy failed, rc=%i (%u bytes, encoding=%i, baseURL=%@)...", result.code,
                        static_cast<unsigned>(bytes.size()), encoding, baseURL);
@@ -104,8 +109,8 @@ bool Tidier::mayTidyHere(std::string_view markup) const {
 }
 
 TidyResult Tidier::tidyHere(std::string_view bytes, int encoding, URL* baseURL) {
+    if (!open()) return TidyResult::nothing("Tidy can't be set up");
     TidyResult result;
-    if (!open()) return result;
     result.code = repair(MarkupEncoding::toUTF8(bytes, encoding), baseURL, result.output);
     if (!result.isSuccess()) {
         result.output.clear();

@@ -122,13 +122,15 @@ TidyResult TidyHelper::tidy(const char* className, std::string_view markup, int 
                             const Foundation::URL* base) {
     if (markup.size() > Bounds::kTidyBytes) {
         Bounds::logHit("kTidyBytes", Bounds::kTidyBytes);
-        return {};
+        return TidyResult::nothing("it is too long");
     }
     const std::string baseText = base ? base->getAbsoluteString()->utf8() : std::string();
     // One that ends for want of work may do so just as work comes.
     for (int tries = 0; tries < 2; ++tries) {
         TidyReply reply;
-        if (!isThere() && !startAndAwait()) return {};
+        if (!isThere() && !startAndAwait()) {
+            return TidyResult::nothing("orvane-tidy does not start");
+        }
         switch (exchange(className, markup, encoding, baseText, reply)) {
             case Outcome::Done:
                 relay(reply.log);
@@ -136,18 +138,15 @@ TidyResult TidyHelper::tidy(const char* className, std::string_view markup, int 
             case Outcome::Late:
                 Bounds::logHit("kTidySeconds", static_cast<std::uint64_t>(mSeconds));
                 reap();
-                return {};
+                return TidyResult::nothing("it took too long");
             case Outcome::Broken:
                 reap();
-                return {};
+                return TidyResult::nothing("orvane-tidy made no sense");
             case Outcome::Ended:
-                if (!reap()) {
-                    gLogParser.log("Tidying has ended orvane-tidy");
-                    return {};
-                }
+                if (!reap()) return TidyResult::nothing("it has ended orvane-tidy");
         }
     }
-    return {};
+    return TidyResult::nothing("orvane-tidy ends before it is asked");
 }
 
 bool TidyHelper::startAndAwait() {

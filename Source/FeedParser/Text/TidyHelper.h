@@ -32,8 +32,8 @@ class TidyHelper : Foundation::Uncopyable {
     /// Ends the program.
     ~TidyHelper();
 
-    /// Tidies as the tidier of the class does. The code is `TidyResult::kNothing` if that takes too
-    /// long or too much, or the program can't be started, which is warned about.
+    /// Tidies as the tidier of the class does. The code is `TidyResult::kNothing`, with the reason,
+    /// if that takes too long or too much, or the program can't be started, which is warned about.
     TidyResult tidy(const char* className, std::string_view markup, int encoding,
                     const Foundation::URL* base);
 

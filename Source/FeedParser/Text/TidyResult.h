@@ -1,6 +1,7 @@
 #pragma once
 
 #include <string>
+#include <utility>
 
 namespace Orvane::FeedParser {
 
@@ -10,12 +11,13 @@ struct TidyResult {
     /// not go on.
     int code = kNothing;
     std::string output;    ///< of 0 and 1
-    std::string messages;  ///< what Tidy wrote about it, of other results
+    std::string messages;  ///< of other results: what Tidy wrote about it, or why there is none
 
     bool isSuccess() const { return code == 0 || code == 1; }
 
     /// There is no result: Tidy could not be set up, or took too much.
     static constexpr int kNothing = -1000;
+    static TidyResult nothing(std::string why) { return {kNothing, {}, std::move(why)}; }
 };
 
 }  // namespace Orvane::FeedParser

@@ -141,12 +141,15 @@ TidyReply TidyService::tidy(const TidyRequest& request) {
     TidyReply reply;
     const LogKeeper keeper(reply.log);
     const auto found = mTidiers.find(request.className);
-    if (found == mTidiers.end()) return reply;
+    if (found == mTidiers.end()) {
+        reply.result = TidyResult::nothing("there is no such tidier");
+        return reply;
+    }
     const Ref<URL> base = URL::url(String::string(request.base));
     reply.result = found->second->tidyHere(request.markup, request.encoding, base.get());
     if (reply.result.output.size() > Bounds::kTidyBytes) {
         Bounds::logHit("kTidyBytes", Bounds::kTidyBytes);
-        reply.result = {};
+        reply.result = TidyResult::nothing("the result is too long");
     }
     return reply;
 }

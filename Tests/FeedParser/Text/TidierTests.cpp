@@ -97,6 +97,49 @@ TEST(Tidier, TellsOfAnEmptyResultAndGivesIt) {
 
 namespace {
 
+struct Layout {
+    const char* name;
+    std::string markup;
+    std::string wanted;
+};
+
+void PrintTo(const Layout& layout, std::ostream* out) {
+    *out << layout.name;
+}
+
+std::string words(int count) {
+    std::string text;
+    for (int i = 0; i < count; ++i)
+        text += "word ";
+    return text;
+}
+
+const Layout kLayouts[] = {
+    {"URLsStay", "<a href=\"a b\">c</a>", "<a href=\"a b\">c</a>"},
+    {"LinesAreNotWrapped", "<p>" + words(100) + "end", words(100) + "end</p>"},
+    {"NothingIsIndented", "<div><p class=\"a\" id=\"b\">c",
+     "\n<div>\n<p class=\"a\" id=\"b\">c</p>\n</div>\n"},
+    {"TabsAreBlanks", "<pre>a\tb</pre>", "<pre>a b</pre>"},
+    {"EntitiesAreNumbers", "<p>a&nbsp;b", "a&#160;b"},
+    {"AmpersandsAreEscaped", "<p>a & b", "a &amp; b"},
+    {"OddAttributesStay", "<p odd=\"a\">b", "<p odd=\"a\">b</p>"},
+    {"OutputIsXHTML", "<p>a<br>b", "<br />"},
+    {"NoMarkIsLeft", "<head><title>a</title></head><p>b", "<head>\n<title>a</title>\n</head>"},
+};
+
+class Layouts : public testing::TestWithParam<Layout> {};
+
+}  // namespace
+
+TEST_P(Layouts, AreAsTheOptionsSay) {
+    const std::string tidied = Tidy<HTMLDocumentTidier>()(GetParam().markup);
+    EXPECT_NE(tidied.find(GetParam().wanted), std::string::npos) << tidied;
+    EXPECT_EQ(tidied.find('\r'), std::string::npos);
+}
+INSTANTIATE_TEST_SUITE_P(Of, Layouts, testing::ValuesIn(kLayouts));
+
+namespace {
+
 /// Counts how often its document is set up; can refuse.
 class CountingTidier : public FeedTidier {
  public:
@@ -127,12 +170,17 @@ TEST(Tidier, MakesANewDocumentAfterAFailureAlone) {
 }
 
 TEST(Tidier, FailsWhereItsOptionsAreRefused) {
+    const Support::LoggingOn on({&Orvane::gLogParser});
     const Support::LogCapture log;
     Tidy<CountingTidier> tidy;
     tidy.tidier().refuses = true;
     EXPECT_FALSE(tidy.tidier().open());
     EXPECT_EQ(tidy.tidy("<rss/>"), "(null)");
     EXPECT_EQ(log.count("Tidier: setupTidyOptions failed!"), 2);
+    EXPECT_EQ(log.count("[Parser] Not tidied (6 bytes, encoding=1, baseURL=(null)): Tidy can't be "
+                        "set up"),
+              1);
+    EXPECT_FALSE(log.contains("Tidy failed"));
     tidy.tidier().refuses = false;
     EXPECT_TRUE(tidy.tidier().open());
 }

@@ -68,6 +68,7 @@ TEST(TidyHelper, IsKilledAtTheDeadlineAndStartedAnew) {
     const TidyResult result = tidy(helper, whatHangs());
     EXPECT_EQ(result.code, TidyResult::kNothing);
     EXPECT_EQ(result.output, "");
+    EXPECT_EQ(result.messages, "it took too long");
     EXPECT_EQ(helper.getPID(), -1);
     EXPECT_TRUE(log.contains("A document has reached the bound \"kTidySeconds\", 0"));
     TidyHelper patient(kLong);
@@ -116,7 +117,7 @@ TEST(TidyHelper, WarnsOnceWhereThereIsNoProgram) {
     const Support::LogCapture log;
     TidyHelper helper(kLong);
     EXPECT_EQ(tidy(helper, "<b>x").code, TidyResult::kNothing);
-    EXPECT_EQ(tidy(helper, "<b>x").code, TidyResult::kNothing);
+    EXPECT_EQ(tidy(helper, "<b>x").messages, "orvane-tidy does not start");
     EXPECT_EQ(log.count("Can't start " + (folder / "orvane-tidy")), 1);
 }
 
@@ -130,6 +131,23 @@ TEST(TidyHelper, WarnsWhereTheProgramIsAnother) {
     EXPECT_EQ(tidy(helper, "<b>x").code, TidyResult::kNothing);
     EXPECT_EQ(log.count(path + " does not start"), 1);
     EXPECT_EQ(helper.getPID(), -1);
+}
+
+TEST(TidyHelper, SaysWhyThereIsNoResult) {
+    const AutoreleasePool pool;
+    TidyHelper helper(kLong);
+    EXPECT_EQ(helper.tidy("NoSuchTidier", "<b>x", 1, nullptr).messages, "there is no such tidier");
+    const std::string tooLong(Bounds::kTidyBytes + 1, '<');
+    EXPECT_EQ(tidy(helper, tooLong).messages, "it is too long");
+    const Support::TempDir folder;
+    const Support::EnvVar programs("ORVANE_PROGRAMS", folder.path().c_str());
+    TidyHelper::getShared().stop();
+    const Support::LoggingOn on({&Orvane::gLogParser});
+    const Support::LogCapture log;
+    EXPECT_EQ(TidierAsked<HTMLSnippetTidier>().tidy("<table>"), "(null)");
+    EXPECT_TRUE(
+        log.contains("[Parser] Not tidied (7 bytes, encoding=1, baseURL=(null)): "
+                     "orvane-tidy does not start"));
 }
 
 TEST(TidyHelper, GetsWhatIsNotSmall) {
