@@ -1,5 +1,6 @@
 #include "FeedParser/DocumentGuard.h"
 
+#include "FeedParser/Text/Blanks.h"
 #include "FeedParser/Text/Bounds.h"
 #include "FeedParser/Text/MarkupEncoding.h"
 #include "Foundation/StringEncoding.h"
@@ -21,10 +22,6 @@ constexpr auto npos = std::string_view::npos;
 
 /// How many bytes an attribute takes at least: a="".
 constexpr std::size_t kShortestAttribute = 4;
-
-bool isBlank(char c) {
-    return c == ' ' || c == '\t' || c == '\n' || c == '\r';
-}
 
 /// Where the text behind `what` begins; the end of the text if it is not there.
 std::size_t behind(std::string_view text, std::string_view what, std::size_t from) {

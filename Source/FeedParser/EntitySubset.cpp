@@ -2,6 +2,7 @@
 
 #include "FeedParser/Text/CharacterEntities.h"
 #include "Foundation/AssertionFailure.h"
+#include "Utilities/XMLText.h"
 
 #include <libxml/entities.h>
 #include <libxml/globals.h>
@@ -15,14 +16,6 @@
 
 namespace Orvane::FeedParser {
 
-namespace {
-
-const xmlChar* asXML(const char* text) {
-    return reinterpret_cast<const xmlChar*>(text);
-}
-
-}  // namespace
-
 EntitySubset& EntitySubset::shared() {
     // Never destroyed: documents may be freed as the process ends.
     static auto* const sShared = new EntitySubset;
@@ -30,7 +23,8 @@ EntitySubset& EntitySubset::shared() {
 }
 
 EntitySubset::EntitySubset()
-    : mScratch(xmlNewDoc(asXML("1.0"))), mSubset(xmlNewDtd(mScratch, nullptr, nullptr, nullptr)) {
+    : mScratch(xmlNewDoc(xmlChars("1.0"))),
+      mSubset(xmlNewDtd(mScratch, nullptr, nullptr, nullptr)) {
     OV_ASSERT(mSubset);
     const auto known = CharacterEntities::all();
     std::vector<CharacterEntities::Entity> entities(known.begin(), known.end());
@@ -46,15 +40,15 @@ EntitySubset::EntitySubset()
 void EntitySubset::add(const char* name, unsigned character) {
     char value[16];
     std::snprintf(value, sizeof value, "&#%u;", character);
-    xmlEntityPtr entity = xmlAddDtdEntity(mScratch, asXML(name), XML_INTERNAL_GENERAL_ENTITY,
-                                          nullptr, nullptr, asXML(value));
+    xmlEntityPtr entity = xmlAddDtdEntity(mScratch, xmlChars(name), XML_INTERNAL_GENERAL_ENTITY,
+                                          nullptr, nullptr, xmlChars(value));
     // The five that XML knows itself cannot be declared anew.
     if (!entity) return;
     // What the parser would otherwise make of the value at the first reference: nodes of a document
     // that ends before the entity does.
     char utf8[8] = {};
     xmlCopyChar(0, reinterpret_cast<xmlChar*>(utf8), static_cast<int>(character));
-    xmlNodePtr text = xmlNewDocText(mScratch, asXML(utf8));
+    xmlNodePtr text = xmlNewDocText(mScratch, xmlChars(utf8));
     OV_ASSERT(text);
     text->parent = reinterpret_cast<xmlNodePtr>(entity);
     entity->children = entity->last = text;

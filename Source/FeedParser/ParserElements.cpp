@@ -3,6 +3,7 @@
 #include "FeedParser/Text/XMLMending.h"
 #include "Foundation/AutoreleasePool.h"
 #include "Foundation/Logger.h"
+#include "Utilities/XMLText.h"
 
 #include <libxml/xmlreader.h>
 #include <cstring>
@@ -17,16 +18,12 @@ using Foundation::Ref;
 
 namespace {
 
-const char* asText(const xmlChar* text) {
-    return reinterpret_cast<const char*>(text);
-}
-
 /// What an element is called. libxml2 leaves a prefix that nothing declares in the name.
 struct ElementName {
     explicit ElementName(const xmlNode* element)
-        : uri(element->ns ? asText(element->ns->href) : nullptr),
-          prefix(element->ns ? asText(element->ns->prefix) : nullptr),
-          local(asText(element->name)) {
+        : uri(element->ns ? xmlCString(element->ns->href) : nullptr),
+          prefix(element->ns ? xmlCString(element->ns->prefix) : nullptr),
+          local(xmlCString(element->name)) {
         const char* colon = element->ns ? nullptr : std::strchr(local, ':');
         if (!colon) return;
         undeclaredPrefix.assign(local, colon);
@@ -43,7 +40,7 @@ struct ElementName {
 
 bool hasOwnBase(const xmlNode* element) {
     for (const xmlAttr* attribute = element->properties; attribute; attribute = attribute->next) {
-        if (attribute->ns && std::strcmp(asText(attribute->name), "base") == 0) return true;
+        if (attribute->ns && std::strcmp(xmlCString(attribute->name), "base") == 0) return true;
     }
     return false;
 }
@@ -64,7 +61,7 @@ class AttributeText {
         constexpr int kDeepest = 16;
         for (; part && depth < kDeepest; part = part->next) {
             if (part->type == XML_TEXT_NODE) {
-                appendText(asText(part->content), depth);
+                appendText(xmlCString(part->content), depth);
             } else if (part->type == XML_ENTITY_REF_NODE && part->children && isWithinBound()) {
                 append(reinterpret_cast<const xmlEntity*>(part->children)->children, depth + 1);
             }
@@ -140,7 +137,7 @@ bool Parser::pushContext(const xmlNode* element) {
     const Context& parent = *mContextStack.back();
     // To ask for the base of each element would walk up to the root each time.
     const bool isAsParent = mContextStack.size() > 1 && !hasOwnBase(element);
-    child->baseURI = isAsParent ? parent.baseURI : asText(xmlTextReaderConstBaseUri(mReader));
+    child->baseURI = isAsParent ? parent.baseURI : xmlCString(xmlTextReaderConstBaseUri(mReader));
     child->info = mInfo.get();
     mContextStack.push_back(child);
     child->start();
@@ -202,19 +199,19 @@ void Parser::handleAttributes(const xmlNode* element) {
     Context& context = *mContextStack.back();
     // The reader counts declarations of namespaces among the attributes, in front of the others.
     for (const xmlNs* space = element->nsDef; space; space = space->next) {
-        const char* prefix = asText(space->prefix);
+        const char* prefix = xmlCString(space->prefix);
         context.gotAttribute(prefix ? "xmlns" : nullptr, prefix ? prefix : "xmlns",
-                             asText(space->href));
+                             xmlCString(space->href));
     }
     for (const xmlAttr* attribute = element->properties; attribute; attribute = attribute->next) {
-        const char* prefix = attribute->ns ? asText(attribute->ns->prefix) : nullptr;
+        const char* prefix = attribute->ns ? xmlCString(attribute->ns->prefix) : nullptr;
         const xmlNode* text = attribute->children;
         if (text && text->type == XML_TEXT_NODE && !text->next) {
-            context.gotAttribute(prefix, asText(attribute->name), asText(text->content));
+            context.gotAttribute(prefix, xmlCString(attribute->name), xmlCString(text->content));
             continue;
         }
         const std::string value = AttributeText(mEntityBytes).read(text);
-        context.gotAttribute(prefix, asText(attribute->name), value.c_str());
+        context.gotAttribute(prefix, xmlCString(attribute->name), value.c_str());
     }
 }
 

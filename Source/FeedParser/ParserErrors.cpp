@@ -2,6 +2,7 @@
 #include "FeedParser/Text/Bounds.h"
 #include "Foundation/Logger.h"
 #include "Foundation/UTF8.h"
+#include "Utilities/XMLText.h"
 
 #include <libxml/encoding.h>
 #include <libxml/parser.h>
@@ -74,8 +75,7 @@ bool Parser::isUTF8() {
 
 bool Parser::claimsToBeUTF8() const {
     const xmlChar* name = xmlTextReaderConstEncoding(mReader);
-    return !name ||
-           xmlParseCharEncoding(reinterpret_cast<const char*>(name)) == XML_CHAR_ENCODING_UTF8;
+    return !name || xmlParseCharEncoding(xmlCString(name)) == XML_CHAR_ENCODING_UTF8;
 }
 
 void Parser::stopAfterTooManyErrors(void* locator) {

@@ -1,5 +1,7 @@
 #include "FeedParser/RawXML.h"
 
+#include "Utilities/XMLText.h"
+
 #include <libxml/parserInternals.h>
 #include <libxml/tree.h>
 #include <algorithm>
@@ -9,10 +11,6 @@
 namespace Orvane::FeedParser {
 
 namespace {
-
-const char* asText(const xmlChar* text) {
-    return reinterpret_cast<const char*>(text);
-}
 
 // What does not stand for itself.
 constexpr const char* kTextSpecials = "<>&\r";
@@ -39,7 +37,7 @@ const char* escapeOf(char special) {
 
 void appendEscaped(const xmlChar* content, const char* specials, std::string& xml) {
     if (!content) return;
-    const char* text = asText(content);
+    const char* text = xmlCString(content);
     while (true) {
         const std::size_t plain = std::strcspn(text, specials);
         xml.append(text, plain);
@@ -105,10 +103,10 @@ bool RawXML::appendNode(const xmlNode* node) {
             appendEscaped(node->content, kTextSpecials, mXML);
             return node->name == xmlStringText;
         case XML_ENTITY_REF_NODE:
-            ((mXML += '&') += asText(node->name)) += ';';
+            ((mXML += '&') += xmlCString(node->name)) += ';';
             return true;
         case XML_COMMENT_NODE:
-            ((mXML += "<!--") += node->content ? asText(node->content) : "") += "-->";
+            ((mXML += "<!--") += node->content ? xmlCString(node->content) : "") += "-->";
             return true;
         default:
             return false;
@@ -147,15 +145,15 @@ bool RawXML::appendStartTag(const xmlNode* element) {
 }
 
 void RawXML::appendName(const xmlNs* space, const xmlChar* name) {
-    if (space && space->prefix) (mXML += asText(space->prefix)) += ':';
-    mXML += asText(name);
+    if (space && space->prefix) (mXML += xmlCString(space->prefix)) += ':';
+    mXML += xmlCString(name);
 }
 
 bool RawXML::appendDeclaration(const xmlNs* space) {
-    if (!space->href || std::strchr(asText(space->href), '"')) return false;
+    if (!space->href || std::strchr(xmlCString(space->href), '"')) return false;
     mXML += " xmlns";
-    if (space->prefix) (mXML += ':') += asText(space->prefix);
-    ((mXML += "=\"") += asText(space->href)) += '"';
+    if (space->prefix) (mXML += ':') += xmlCString(space->prefix);
+    ((mXML += "=\"") += xmlCString(space->href)) += '"';
     return true;
 }
 
@@ -165,7 +163,7 @@ bool RawXML::appendAttribute(const xmlAttr* attribute) {
     mXML += "=\"";
     for (const xmlNode* part = attribute->children; part; part = part->next) {
         if (part->type == XML_ENTITY_REF_NODE) {
-            ((mXML += '&') += asText(part->name)) += ';';
+            ((mXML += '&') += xmlCString(part->name)) += ';';
             continue;
         }
         // Where the document names no encoding, libxml2 writes references for them.
@@ -184,14 +182,14 @@ bool RawXML::appendByLibrary(xmlNodePtr tree) {
                                                                       xmlBufferFree);
     if (!copy || !buffer) return false;
     if (xmlNodeDump(buffer.get(), tree->doc, copy.get(), 0, 0) < 0) return false;
-    mXML.append(asText(xmlBufferContent(buffer.get())),
+    mXML.append(xmlCString(xmlBufferContent(buffer.get())),
                 static_cast<std::size_t>(xmlBufferLength(buffer.get())));
     return true;
 }
 
 void RawXML::need(const xmlNs* space, const xmlNode* user) {
     if (!space || std::find(mNeeded.begin(), mNeeded.end(), space) != mNeeded.end()) return;
-    if (space->prefix && std::strcmp(asText(space->prefix), "xml") == 0) return;
+    if (space->prefix && std::strcmp(xmlCString(space->prefix), "xml") == 0) return;
     for (const xmlNode* node = user;; node = node->parent) {
         if (isDeclaredAt(node, space)) return;
         if (node == mRoot) break;

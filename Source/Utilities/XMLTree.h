@@ -2,9 +2,8 @@
 
 #include "Foundation/Ref.h"
 #include "Foundation/RefCounted.h"
+#include "Utilities/XMLText.h"
 
-#include <string>
-#include <string_view>
 #include <vector>
 
 struct _xmlDoc;
@@ -33,14 +32,5 @@ class XMLTree : public Foundation::RefCounted {
     _xmlDoc* mDocument;
     std::vector<_xmlNode*> mDetached;
 };
-
-/// A text for libxml2. Valid as long as `text`.
-inline const unsigned char* xmlChars(const std::string& text) {
-    return reinterpret_cast<const unsigned char*>(text.c_str());
-}
-/// A text of libxml2, which may be null: an empty one then.
-inline std::string_view xmlView(const unsigned char* text) {
-    return text ? std::string_view(reinterpret_cast<const char*>(text)) : std::string_view();
-}
 
 }  // namespace Orvane

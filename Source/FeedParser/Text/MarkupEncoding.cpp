@@ -1,10 +1,12 @@
 #include "FeedParser/Text/MarkupEncoding.h"
 
+#include "FeedParser/Text/Blanks.h"
+#include "FeedParser/Text/XMLCharacters.h"
 #include "Foundation/StringEncoding.h"
 #include "Foundation/UTF8.h"
 
-#include <algorithm>
 #include <cstddef>
+#include <iterator>
 #include <optional>
 
 namespace Orvane::FeedParser {
@@ -37,14 +39,6 @@ constexpr const char* kNames[] = {
     "ISO-8859-3", "ISO-8859-4",  "ISO-8859-5", "ISO-8859-6", "ISO-8859-7",   "ISO-8859-8",
     "ISO-8859-9", "ISO-2022-JP", "Shift_JIS",  "EUC-JP",     "windows-1252",
 };
-
-bool isBlank(char c) {
-    return c == ' ' || c == '\t' || c == '\n' || c == '\r';
-}
-
-char lower(char c) {
-    return c >= 'A' && c <= 'Z' ? static_cast<char>(c + ('a' - 'A')) : c;
-}
 
 /// What follows "=" in `text`, in quotes or not.
 std::string valueIn(std::string_view text) {
@@ -82,8 +76,7 @@ std::optional<StringEncoding> encodingOf(std::string_view bytes, int encoding) {
 }  // namespace
 
 std::string MarkupEncoding::getDeclared(std::string_view markup) {
-    std::string start(markup.substr(0, kPrescan));
-    std::transform(start.begin(), start.end(), start.begin(), lower);
+    const std::string start = XMLCharacters::toLower(markup.substr(0, kPrescan));
     const bool isXML = start.find("<?xml") != std::string::npos;
     const std::size_t word = start.find(isXML ? "encoding" : "charset");
     if (word == std::string::npos) return {};

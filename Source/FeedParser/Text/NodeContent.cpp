@@ -1,5 +1,7 @@
 #include "FeedParser/Text/NodeContent.h"
 
+#include "Utilities/XMLText.h"
+
 #include <libxml/tree.h>
 #include <libxml/xmlstring.h>
 
@@ -9,7 +11,7 @@ namespace {
 
 bool isReadable(const xmlNode* element) {
     for (const char* hidden : {"script", "style", "object", "img", "head"}) {
-        if (xmlStrcasestr(element->name, reinterpret_cast<const xmlChar*>(hidden))) return false;
+        if (xmlStrcasestr(element->name, xmlChars(hidden))) return false;
     }
     return true;
 }
@@ -18,7 +20,7 @@ void appendText(const xmlNode* node, Foundation::MutableString& output) {
     const bool isText = node->type == XML_TEXT_NODE || node->type == XML_CDATA_SECTION_NODE ||
                         node->type == XML_ENTITY_REF_NODE;
     if (!isText || !node->content) return;
-    output.append(std::string_view(reinterpret_cast<const char*>(node->content)));
+    output.append(xmlView(node->content));
     output.append(std::string_view(" "));
 }
 

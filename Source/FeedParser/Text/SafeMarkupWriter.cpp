@@ -1,8 +1,10 @@
 #include "FeedParser/Text/SafeMarkupWriter.h"
 
+#include "FeedParser/Text/Blanks.h"
 #include "FeedParser/Text/ForeignElements.h"
 #include "FeedParser/Text/HTMLElements.h"
 #include "FeedParser/Text/XMLCharacters.h"
+#include "Utilities/XMLText.h"
 
 #include <libxml/tree.h>
 
@@ -22,16 +24,12 @@ constexpr std::string_view kMathML = "http://www.w3.org/1998/Math/MathML";
 /// Of the tree that is written. What is deeper is nothing that a reader could see.
 constexpr int kDeepest = 1000;
 
-std::string_view viewOf(const xmlChar* text) {
-    return text ? reinterpret_cast<const char*>(text) : "";
-}
-
 std::string valueOf(const xmlAttr* attribute) {
     const xmlNode* child = attribute->children;
     if (!child) return {};
-    if (!child->next && child->type == XML_TEXT_NODE) return std::string(viewOf(child->content));
+    if (!child->next && child->type == XML_TEXT_NODE) return std::string(xmlView(child->content));
     xmlChar* value = xmlNodeListGetString(attribute->doc, child, 1);
-    std::string result(viewOf(value));
+    std::string result(xmlView(value));
     xmlFree(value);
     return result;
 }
@@ -39,9 +37,9 @@ std::string valueOf(const xmlAttr* attribute) {
 /// The name in lower case, with "xml:" or "xlink:" where it has that prefix. Empty for other
 /// prefixes.
 std::string nameOf(const xmlAttr* attribute) {
-    std::string name = XMLCharacters::toLower(viewOf(attribute->name));
+    std::string name = XMLCharacters::toLower(xmlView(attribute->name));
     if (!attribute->ns) return name;
-    const std::string_view prefix = viewOf(attribute->ns->prefix);
+    const std::string_view prefix = xmlView(attribute->ns->prefix);
     if (prefix == "xml" || prefix == "xlink") return std::string(prefix) + ":" + name;
     return {};
 }
@@ -54,7 +52,7 @@ std::string attributeOf(const xmlNode* node, std::string_view name) {
 }
 
 std::string_view namespaceOf(const xmlNode* node) {
-    return node->ns ? viewOf(node->ns->href) : std::string_view();
+    return node->ns ? xmlView(node->ns->href) : std::string_view();
 }
 
 template <std::size_t N>
@@ -91,10 +89,10 @@ void SafeMarkupWriter::writeNode(const _xmlNode* node, const Place& place) {
             return writeElement(node, place);
         case XML_TEXT_NODE:
         case XML_CDATA_SECTION_NODE:
-            return writeText(viewOf(node->content));
+            return writeText(xmlView(node->content));
         case XML_ENTITY_REF_NODE:
             mOut += "&amp;";
-            writeText(viewOf(node->name));
+            writeText(xmlView(node->name));
             mOut += ';';
             return;
         default:
@@ -103,7 +101,7 @@ void SafeMarkupWriter::writeNode(const _xmlNode* node, const Place& place) {
 }
 
 void SafeMarkupWriter::writeElement(const _xmlNode* node, const Place& place) {
-    const std::string name = XMLCharacters::toLower(viewOf(node->name));
+    const std::string name = XMLCharacters::toLower(xmlView(node->name));
     const std::string_view space = namespaceOf(node);
     const bool isForeign = place.vocabulary != Vocabulary::HTML;
     if (space == kSVG || (space.empty() && place.vocabulary == Vocabulary::SVG)) {
@@ -124,7 +122,7 @@ void SafeMarkupWriter::writeElement(const _xmlNode* node, const Place& place) {
 
 void SafeMarkupWriter::writeHTML(const _xmlNode* node, const std::string& name, Place place) {
     const HTMLElement* element = HTMLElement::find(name);
-    if (element && element->is(HTMLElement::Left) && name != "input") return;
+    if (element && element->is(HTMLElement::Left)) return;
     // A link within a link can't be.
     const bool isSecondLink = name == "a" && place.isInLink;
     if (!element || !element->is(HTMLElement::Shown) || isSecondLink) {
@@ -152,10 +150,12 @@ void SafeMarkupWriter::writeUnshown(const _xmlNode* node, const std::string& nam
 }
 
 void SafeMarkupWriter::writeSVG(const _xmlNode* node, const std::string& name, Place place) {
-    const std::string_view spelling = ForeignElements::findSVG(name);
-    if (spelling.empty() || (name == "a" && place.isInLink)) return;
     Place inside = place;
     inside.vocabulary = Vocabulary::SVG;
+    // Of these a reader sees what they hold.
+    if (name == "switch" || name == "textpath") return writeChildren(node, inside);
+    const std::string_view spelling = ForeignElements::findSVG(name);
+    if (spelling.empty() || (name == "a" && place.isInLink)) return;
     inside.space = kSVG;
     if (name == "a") inside.isInLink = true;
     writeWhole(node, name, spelling, place, inside, false);
@@ -254,26 +254,10 @@ void SafeMarkupWriter::writeAttribute(std::string_view name, std::string_view va
     mOut += name;
     mOut += "=\"";
     for (const char c : value) {
-        switch (c) {
-            case '&':
-                mOut += "&amp;";
-                break;
-            case '<':
-                mOut += "&lt;";
-                break;
-            case '>':
-                mOut += "&gt;";
-                break;
-            case '"':
-                mOut += "&quot;";
-                break;
-            case '\t':
-            case '\n':
-            case '\r':
-                mOut += ' ';
-                break;
-            default:
-                mOut += c;
+        if (isBlank(c)) {
+            mOut += ' ';
+        } else {
+            writeEscaped(c);
         }
     }
     mOut += '"';
@@ -287,27 +271,32 @@ void SafeMarkupWriter::writeText(std::string_view text) {
         if (end == std::string_view::npos) return;
         const char c = text[end];
         text.remove_prefix(end + 1);
-        switch (c) {
-            case '&':
-                mOut += "&amp;";
-                break;
-            case '<':
-                mOut += "&lt;";
-                break;
-            case '>':
-                mOut += "&gt;";
-                break;
-            case '\r':
-                break;
-            default:
-                // A no-break space can't be told from a space by who looks at the text.
-                if (text.starts_with('\xA0')) {
-                    mOut += "&#160;";
-                    text.remove_prefix(1);
-                } else {
-                    mOut += c;
-                }
+        if (c == '\xC2' && text.starts_with('\xA0')) {
+            // A no-break space can't be told from a space by who looks at the text.
+            mOut += "&#160;";
+            text.remove_prefix(1);
+        } else if (c != '\r') {
+            writeEscaped(c);
         }
+    }
+}
+
+void SafeMarkupWriter::writeEscaped(char c) {
+    switch (c) {
+        case '&':
+            mOut += "&amp;";
+            break;
+        case '<':
+            mOut += "&lt;";
+            break;
+        case '>':
+            mOut += "&gt;";
+            break;
+        case '"':
+            mOut += "&quot;";
+            break;
+        default:
+            mOut += c;
     }
 }
 

@@ -46,6 +46,7 @@ class SafeMarkupWriter : Foundation::Uncopyable {
     void writeAttributes(const _xmlNode* node, std::string_view element, Vocabulary vocabulary);
     void writeAttribute(std::string_view name, std::string_view value);
     void writeText(std::string_view text);
+    void writeEscaped(char c);
 
     SafeAttributes mAttributes;
     std::string mOut;

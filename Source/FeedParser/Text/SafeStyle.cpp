@@ -30,14 +30,6 @@ constexpr std::string_view kProperties[] = {
 /// All the functions that a value may call.
 constexpr std::string_view kFunctions[] = {"hsl", "hsla", "rgb", "rgba"};
 
-std::string_view trimmed(std::string_view text) {
-    while (!text.empty() && isBlank(text.front()))
-        text.remove_prefix(1);
-    while (!text.empty() && isBlank(text.back()))
-        text.remove_suffix(1);
-    return text;
-}
-
 bool isAllowedProperty(const std::string& name) {
     if (std::binary_search(std::begin(kProperties), std::end(kProperties), name)) return true;
     return std::any_of(
@@ -87,8 +79,9 @@ std::string SafeStyle::make(std::string_view declarations) {
         declarations.remove_prefix(std::min(end + 1, declarations.size()));
         const std::size_t colon = declaration.find(':');
         if (colon == npos) continue;
-        const std::string property = XMLCharacters::toLower(trimmed(declaration.substr(0, colon)));
-        const std::string_view value = trimmed(declaration.substr(colon + 1));
+        const std::string property =
+            XMLCharacters::toLower(withoutOuterBlanks(declaration.substr(0, colon)));
+        const std::string_view value = withoutOuterBlanks(declaration.substr(colon + 1));
         if (!isAllowedProperty(property) || !isAllowedValue(property, value)) continue;
         if (!result.empty()) result += "; ";
         result += property;

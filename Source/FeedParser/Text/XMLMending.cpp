@@ -92,14 +92,6 @@ bool isURICharacter(char c) {
            std::string_view("-._~:/?#@!$&'()*+,;=%").find(c) != npos;
 }
 
-std::string_view trimmed(std::string_view text) {
-    while (!text.empty() && isBlank(text.front()))
-        text.remove_prefix(1);
-    while (!text.empty() && isBlank(text.back()))
-        text.remove_suffix(1);
-    return text;
-}
-
 }  // namespace
 
 XMLMending::XMLMending(Kind kind, bool isUTF8) : mKind(kind), mIsUTF8(isUTF8) {}
@@ -281,7 +273,7 @@ XMLMending::Attributes XMLMending::readAttributes(std::string_view text) {
 void XMLMending::cleanNamespace(std::string& uri) const {
     std::string clean;
     constexpr char kHex[] = "0123456789ABCDEF";
-    for (const char c : trimmed(uri)) {
+    for (const char c : withoutOuterBlanks(uri)) {
         if (isURICharacter(c)) {
             clean += c;
         } else {

@@ -117,6 +117,10 @@ const Case kCases[] = {
      "<svg xmlns=\"http://www.w3.org/2000/svg\" viewBox=\"0 0 1 1\"><g>"
      "<path d=\"M0\" fill=\"url(#tarnwick-rss-a)\"></path></g>"
      "<linearGradient id=\"tarnwick-rss-a\"></linearGradient><a><text>e</text></a></svg>"},
+    {"ChoicesInDrawings",
+     "<svg><switch><foreignObject><p>a</p></foreignObject><g onclick=\"x\"><text>b<textPath "
+     "href=\"#c\">d</textPath></text></g></switch></svg>",
+     "<svg xmlns=\"http://www.w3.org/2000/svg\"><g><text>bd</text></g></svg>"},
     {"Formulas",
      "<math href=\"javascript:x\"><mrow "
      "mathcolor=\"red\"><mi>x</mi><mtext><script>a</script></mtext>"
