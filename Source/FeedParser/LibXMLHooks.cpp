@@ -38,8 +38,12 @@ LibXMLHooks::LibXMLHooks(Parser& parser) : mSavedLoader(xmlGetExternalEntityLoad
 }
 
 LibXMLHooks::~LibXMLHooks() {
-    xmlSetGenericErrorFunc(nullptr, nullptr);
+    endReading();
     xmlSetExternalEntityLoader(mSavedLoader);
+}
+
+void LibXMLHooks::endReading() {
+    xmlSetGenericErrorFunc(nullptr, nullptr);
 }
 
 }  // namespace Orvane::FeedParser

@@ -16,6 +16,9 @@ class LibXMLHooks : Foundation::Uncopyable {
     explicit LibXMLHooks(Parser& parser);
     ~LibXMLHooks();
 
+    /// The document is read: nothing more is told to the parser.
+    void endReading();
+
  private:
     using Loader = _xmlParserInput* (*)(const char*, const char*, _xmlParserCtxt*);
 

@@ -7,6 +7,7 @@
 #include "Foundation/Guard.h"
 #include "Foundation/Logger.h"
 #include "SQLite/RowIterator.h"
+#include "Utilities/XMLText.h"
 
 #include <libxml/encoding.h>
 #include <libxml/xmlreader.h>
@@ -63,6 +64,7 @@ class Parser::Attempt : Foundation::Uncopyable {
     }
 
     DocumentInput& input() { return mInput; }
+    void endReading() { mHooks.endReading(); }
 
  private:
     Parser& mParser;
@@ -114,6 +116,7 @@ void Parser::attemptParse() {
         Attempt attempt(*this);
         if (!openReader(attempt)) return;
         readDocument();
+        attempt.endReading();
         if (mFatalError) ++mAttempt;
         if (mAttempt == 1) learnFromFirstAttempt();
         unwind();
@@ -143,11 +146,13 @@ void Parser::clearAttempt() {
 
 bool Parser::openReader(Attempt& attempt) {
     constexpr int kOptions = XML_PARSE_RECOVER | XML_PARSE_NONET | XML_PARSE_NOCDATA;
+    const char* encoding = forcedEncoding(mAttempt);
+    // Else what the document declares would replace it.
+    const int options = encoding ? kOptions | XML_PARSE_IGNORE_ENC : kOptions;
     const Ref<String> base = mInfo->url.get() ? mInfo->url->getString() : nullptr;
     // Piece by piece, so that it can be ended where it takes too long.
     mReader = xmlReaderForIO(DocumentInput::read, nullptr, &attempt.input(),
-                             base.get() ? base->utf8().c_str() : nullptr, forcedEncoding(mAttempt),
-                             kOptions);
+                             base.get() ? base->utf8().c_str() : nullptr, encoding, options);
     if (!mReader) {
         gWarn.log("FeedParser:  xmlReaderForMemory() failed!");
         return false;
@@ -157,7 +162,7 @@ bool Parser::openReader(Attempt& attempt) {
     // References stay in the XML that contexts get, who undo them with all other escapes.
     xmlTextReaderSetParserProp(mReader, XML_PARSER_SUBST_ENTITIES, 0);
     Ref<Context> root = Context::newRootContext();
-    root->baseURI = reinterpret_cast<const char*>(xmlTextReaderConstBaseUri(mReader));
+    root->baseURI = xmlCString(xmlTextReaderConstBaseUri(mReader));
     root->info = mInfo.get();
     mContextStack.push_back(std::move(root));
     return true;
@@ -183,8 +188,7 @@ void Parser::learnFromFirstAttempt() {
         // A document that is not the UTF-8 which it claims to be is taken for Latin-1.
         mEncoding = XML_CHAR_ENCODING_8859_1;
     } else {
-        const xmlChar* name = xmlTextReaderConstEncoding(mReader);
-        mEncoding = xmlParseCharEncoding(reinterpret_cast<const char*>(name));
+        mEncoding = xmlParseCharEncoding(xmlCString(xmlTextReaderConstEncoding(mReader)));
     }
     if (mInfo->kind == Info::PageKind && mInfo->page.get()) mTidyAsHTML = true;
 }

@@ -121,7 +121,21 @@ TEST_F(ParserTest, ResetsTheIndentationOfItsLogs) {
     EXPECT_EQ(lastLine(), "[Parser] Finished parsing; mAttempt=0, mFatalError=0");
 }
 
+TEST_F(ParserTest, ForcesWindowsLatinUponTheThirdAttempt) {
+    // No repair knows the encoding, so it stays the one that the document names.
+    const json found = parsed("<?xml version=\"1.0\" encoding=\"x-unknown\"?>" +
+                              rss("<title>caf\xE9 \x80</title>"));
+    EXPECT_EQ(found["feed"]["title"], "caf\xC3\xA9 \xE2\x82\xAC");
+    EXPECT_EQ(found["attempts"], 3);
+    EXPECT_EQ(lastLine(), "[Parser] Finished parsing; mAttempt=2, mFatalError=0");
+}
+
 // Errors
+
+TEST_F(ParserTest, SaysWhichErrorsAreFatalAndWhereTheyAre) {
+    parsed("<rss>\n<channel>\n</b></channel></rss>");
+    EXPECT_TRUE(log.contains("[Parser] Fatal Error 76, Line 2: Opening and ending tag mismatch"));
+}
 
 TEST_F(ParserTest, TakesAnyErrorInAFeedForAReasonToRepairIt) {
     // libxml2 itself goes on after an undeclared prefix.
@@ -176,10 +190,10 @@ TEST_F(ParserTest, MatchesNoForeignNamesWithoutAPrefixOtherwise) {
 class Recovery : public ParserTest, public testing::WithParamInterface<const char*> {};
 
 TEST_P(Recovery, ReadsWhatNoRepairTakesAway) {
-    const json found = parsed(
-        rss("<title>A</title>" + padding() + "<item>" + GetParam() + "<title>B</title></item>"));
+    const json found = parsed(rss("<title>\xC3\x84</title>" + padding() + "<item>" + GetParam() +
+                                  "<title>B</title></item>"));
     EXPECT_EQ(found["kind"], "feed");
-    EXPECT_EQ(found["feed"]["title"], "A");
+    EXPECT_EQ(found["feed"]["title"], "\xC3\x84");
     EXPECT_EQ(valueAt(found, "entries[0].title"), "B");
 }
 INSTANTIATE_TEST_SUITE_P(All, Recovery,
