@@ -194,6 +194,20 @@ std::string Bus::getNameOwner(const std::string& name) {
     return owner;
 }
 
+std::uint32_t Bus::getProcessID(const std::string& name) {
+    BusMessage reply = callMethod(busMethod("GetConnectionUnixProcessID"), name);
+    std::uint32_t process = 0;
+    if (reply.isValid()) reply.read(process);
+    return process;
+}
+
+bool Bus::canStart(const std::string& name) {
+    BusMessage reply = callMethod(busMethod("ListActivatableNames"));
+    std::vector<std::string> names;
+    if (reply.isValid()) reply.read(names);
+    return std::find(names.begin(), names.end(), name) != names.end();
+}
+
 std::vector<std::string> Bus::listNames() {
     BusMessage reply = callMethod(busMethod("ListNames"));
     std::vector<std::string> names;
@@ -231,6 +245,13 @@ void Bus::ready(short) {
         dispatch(message);
     }
     if (mConnection && !mConnection->isOpen() && mIncoming.empty()) noteLoss();
+}
+
+void Bus::deliverArrived() {
+    do {
+        ready(0);
+        if (mConnection && mIncoming.empty()) mConnection->pump(kMessagesPerTurn, mIncoming);
+    } while (!mIncoming.empty());
 }
 
 }  // namespace Foundation

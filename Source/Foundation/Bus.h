@@ -47,6 +47,7 @@ using BusSubscriptionPtr = std::unique_ptr<BusSubscription>;
 class Bus : RunLoopSource {
  public:
     using SignalHandler = std::function<void(BusMessage& signal)>;
+    using CallHandler = std::function<void(BusMessage& call)>;
     /// An owner is a unique name, or empty for none.
     using NameHandler = std::function<void(const std::string& name, const std::string& oldOwner,
                                            const std::string& newOwner)>;
@@ -101,12 +102,25 @@ class Bus : RunLoopSource {
     /// Takes the matching signals that others ask the bus for.
     [[nodiscard]] BusSubscriptionPtr handleSignals(const BusMatch& match, SignalHandler handler);
 
+    /// Calls `handler` with the calls of methods of the object at `path`, which it is to answer, at
+    /// once or later: `send` with the call's `newReply`, or `replyError`. A call that makes it
+    /// throw is answered with an error. Objects above it in the tree answer to introspection.
+    [[nodiscard]] BusSubscriptionPtr handleCalls(const std::string& path, CallHandler handler);
+    /// Answers a call with an error.
+    void replyError(const BusMessage& call, const char* name, const std::string& text);
+    /// Delivers all that has come by now.
+    void deliverArrived();
+
     /// Makes this connection the owner of a well-known name. False if another owns it, who keeps
     /// it, or there is no bus. A new connection takes the name again, or then.
     bool requestName(const std::string& name);
     void releaseName(const std::string& name);
     /// The unique name of the owner, empty if there is none.
     std::string getNameOwner(const std::string& name);
+    /// The process behind a name; 0 if there is none, or it is not known.
+    std::uint32_t getProcessID(const std::string& name);
+    /// Whether the bus can start who owns the name.
+    bool canStart(const std::string& name);
     /// All names on the bus, unique ones included. Empty without a bus.
     std::vector<std::string> listNames();
     /// Calls `handler` whenever the owner of `name` changes from what `getWatchedOwner` gives at
@@ -151,6 +165,8 @@ class Bus : RunLoopSource {
 
     void dispatch(BusMessage& message);
     void dispatchSignal(BusMessage& signal);
+    void dispatchCall(BusMessage& call);
+    std::string describeBelow(const std::string& path) const;
     bool isFromItsSender(const BusMatch& match, const BusMessage& signal) const;
     void noteNameOwnerChanged(const BusMessage& signal);
     void tellWatchersSoon(const std::string& name, const std::string& oldOwner,

@@ -59,7 +59,7 @@ class BusConnection : Uncopyable {
     /// Calls and waits for the answer. What else comes meanwhile is kept for `pump`.
     BusMessage call(BusMessage& message, double timeoutSeconds);
     /// Answers a call with an error.
-    void replyError(const BusMessage& call, const char* name, const char* text);
+    static void replyError(const BusMessage& call, const char* name, const char* text);
 
  private:
     explicit BusConnection(sd_bus* bus) : mBus(bus) {}

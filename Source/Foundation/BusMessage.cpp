@@ -65,9 +65,18 @@ bool BusMessage::isSignal(const std::string& path, const std::string& interface,
            isWanted(member, sd_bus_message_get_member(mMessage));
 }
 
+bool BusMessage::isCall() const {
+    return mMessage && sd_bus_message_is_method_call(mMessage, nullptr, nullptr) > 0;
+}
+
 bool BusMessage::expectsReply() const {
-    return mMessage && sd_bus_message_is_method_call(mMessage, nullptr, nullptr) > 0 &&
-           sd_bus_message_get_expect_reply(mMessage) > 0;
+    return isCall() && sd_bus_message_get_expect_reply(mMessage) > 0;
+}
+
+BusMessage BusMessage::newReply() const {
+    sd_bus_message* reply = nullptr;
+    if (mMessage) sd_bus_message_new_method_return(mMessage, &reply);
+    return BusMessage(reply);
 }
 
 std::string BusMessage::getErrorName() const {
@@ -119,6 +128,11 @@ BusMessage& BusMessage::setDestination(const std::string& name) {
     return *this;
 }
 
+BusMessage& BusMessage::withoutStart() {
+    noteResult(sd_bus_message_set_auto_start(mMessage, 0));
+    return *this;
+}
+
 BusMessage& BusMessage::append(const std::string& text) {
     // The bus's strings end at their first zero: half a text would be worse than none.
     const bool fits = text.find('\0') == std::string::npos;
@@ -128,6 +142,10 @@ BusMessage& BusMessage::append(const std::string& text) {
 BusMessage& BusMessage::append(bool value) {
     const int wide = value;
     noteResult(sd_bus_message_append_basic(mMessage, 'b', &wide));
+    return *this;
+}
+BusMessage& BusMessage::append(std::uint8_t value) {
+    noteResult(sd_bus_message_append_basic(mMessage, 'y', &value));
     return *this;
 }
 BusMessage& BusMessage::append(std::int32_t value) {
@@ -158,6 +176,10 @@ BusMessage& BusMessage::append(std::span<const std::uint8_t> bytes) {
     noteResult(sd_bus_message_append_array(mMessage, 'y', bytes.data(), bytes.size()));
     return *this;
 }
+BusMessage& BusMessage::append(std::span<const std::int64_t> values) {
+    noteResult(sd_bus_message_append_array(mMessage, 'x', values.data(), values.size_bytes()));
+    return *this;
+}
 BusMessage& BusMessage::open(char type, const char* contents) {
     noteResult(sd_bus_message_open_container(mMessage, type, contents));
     return *this;
@@ -182,6 +204,9 @@ bool BusMessage::read(bool& value) {
     if (!readBasic('b', &wide)) return false;
     value = wide != 0;
     return true;
+}
+bool BusMessage::read(std::uint8_t& value) {
+    return readBasic('y', &value);
 }
 bool BusMessage::read(std::int32_t& value) {
     return readBasic('i', &value);
@@ -213,6 +238,14 @@ bool BusMessage::read(std::span<const std::uint8_t>& bytes) {
     std::size_t size = 0;
     if (!mMessage || sd_bus_message_read_array(mMessage, 'y', &data, &size) <= 0) return false;
     bytes = {static_cast<const std::uint8_t*>(data), size};
+    return true;
+}
+
+bool BusMessage::read(std::span<const std::int64_t>& values) {
+    const void* data = nullptr;
+    std::size_t size = 0;
+    if (!mMessage || sd_bus_message_read_array(mMessage, 'x', &data, &size) <= 0) return false;
+    values = {static_cast<const std::int64_t*>(data), size / sizeof(std::int64_t)};
     return true;
 }
 

@@ -34,8 +34,12 @@ class BusMessage {
     /// Whether it is this signal; what is empty does not matter.
     bool isSignal(const std::string& path, const std::string& interface,
                   const std::string& member) const;
+    /// Whether this is a call of a method.
+    bool isCall() const;
     /// Whether this is a call whose sender waits for an answer.
     bool expectsReply() const;
+    /// An empty answer to this call, for `Bus::send`, which drops one that nobody waits for.
+    BusMessage newReply() const;
     /// The error's name, such as "org.freedesktop.DBus.Error.NoReply"; empty if this is none.
     std::string getErrorName() const;
     std::string getErrorText() const;
@@ -55,12 +59,15 @@ class BusMessage {
 
     /// Addresses a signal to one connection instead of everybody who asked for it.
     BusMessage& setDestination(const std::string& name);
+    /// Lets a call fail if nobody owns the name that it is for, instead of starting who would.
+    BusMessage& withoutStart();
 
     // Appending. What cannot be appended makes the message one that is never sent.
     BusMessage& append(std::string_view text) { return append(std::string(text)); }
     BusMessage& append(const char* text) { return append(std::string(text)); }
     BusMessage& append(const std::string& text);
     BusMessage& append(bool value);
+    BusMessage& append(std::uint8_t value);
     BusMessage& append(std::int32_t value);
     BusMessage& append(std::uint32_t value);
     BusMessage& append(std::int64_t value);
@@ -70,6 +77,8 @@ class BusMessage {
     BusMessage& appendSignature(const char* signature);
     /// Bytes, "ay".
     BusMessage& append(std::span<const std::uint8_t> bytes);
+    /// Numbers, "ax".
+    BusMessage& append(std::span<const std::int64_t> values);
     /// Opens an array 'a', variant 'v', structure 'r' or dictionary entry 'e' of `contents`.
     BusMessage& open(char type, const char* contents);
     BusMessage& close();
@@ -78,6 +87,7 @@ class BusMessage {
     // is of another type.
     bool read(std::string& text);
     bool read(bool& value);
+    bool read(std::uint8_t& value);
     bool read(std::int32_t& value);
     bool read(std::uint32_t& value);
     bool read(std::int64_t& value);
@@ -88,6 +98,8 @@ class BusMessage {
     bool read(std::vector<std::string>& texts);
     /// Bytes, "ay". They are the message's.
     bool read(std::span<const std::uint8_t>& bytes);
+    /// Numbers, "ax". They are the message's.
+    bool read(std::span<const std::int64_t>& values);
     /// A file descriptor of the caller's own; -1 if the next argument is none.
     int readDescriptor();
     /// The type letter of the next argument, and what it contains if it is a container; 0 at the

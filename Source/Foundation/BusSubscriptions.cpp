@@ -120,9 +120,8 @@ void Bus::dispatch(BusMessage& message) {
             noteNameOwnerChanged(message);
         }
         dispatchSignal(message);
-    } else if (message.expectsReply() && mConnection) {
-        mConnection->replyError(message, "org.freedesktop.DBus.Error.UnknownObject",
-                                "There is no such object");
+    } else if (message.isCall()) {
+        dispatchCall(message);
     }
 }
 

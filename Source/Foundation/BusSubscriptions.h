@@ -11,6 +11,8 @@ struct Bus::Subscription {
     BusMatch match;
     std::string rule;  ///< what the bus was asked for; empty if it need not be
     SignalHandler signalHandler;
+    std::string path;  ///< of an object
+    CallHandler callHandler;
     std::string watchedName;  ///< of a watch; empty for all names
     NameHandler nameHandler;
     bool isOver = false;  ///< for deliveries that had begun before

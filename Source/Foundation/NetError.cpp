@@ -48,6 +48,7 @@ constexpr Name kMachErrorTexts[] = {
     {MachError::kInvalidDestination, "invalid destination"},
     {MachError::kSendTimedOut, "send timed out"},
     {MachError::kReceiveTimedOut, "receive timed out"},
+    {MachError::kBadReply, "bad reply"},
     {MachError::kUnknownRoutine, "unknown routine"},
     {MachError::kBadArguments, "bad arguments"},
     {MachError::kServerDied, "server died"},

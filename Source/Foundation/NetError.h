@@ -85,6 +85,7 @@ namespace MachError {
 inline constexpr std::int32_t kInvalidDestination = 0x10000003;
 inline constexpr std::int32_t kSendTimedOut = 0x10000004;
 inline constexpr std::int32_t kReceiveTimedOut = 0x10004003;
+inline constexpr std::int32_t kBadReply = -301;
 inline constexpr std::int32_t kUnknownRoutine = -303;
 inline constexpr std::int32_t kBadArguments = -304;
 inline constexpr std::int32_t kServerDied = -308;
