@@ -1,6 +1,7 @@
 #include "Model/MinistryOfTruth.h"
 
 #include "Foundation/Clock.h"
+#include "Foundation/Data.h"
 #include "Foundation/Dictionary.h"
 #include "Foundation/Guard.h"
 #include "Foundation/Logger.h"
@@ -10,6 +11,7 @@
 #include "Model/Migrations.h"
 #include "Model/OlderDatabase.h"
 #include "Model/Schema.h"
+#include "Model/TruthRemoval.h"
 #include "Model/TruthRestore.h"
 #include "SQLite/Database.h"
 #include "SQLite/Exception.h"
@@ -49,6 +51,34 @@ void moveIfThere(const char* name, bool isDirectory, URL* location) {
     if (FileUtils::exists(from) && !FileUtils::move(from, location, error)) {
         gWarn.log("Could not move <%@> to <%@>: %@", from, location, error);
     }
+}
+
+/// An empty file that is there while the file of clients is behind the database, so that whoever
+/// starts next knows if this process ends before it has saved it.
+URLReturner markOfPListBehind() {
+    return inStorage(".clients-changed", false);
+}
+
+bool isPListBehind() {
+    const Ref<URL> mark = markOfPListBehind();
+    return FileUtils::exists(mark);
+}
+
+void markPListBehind() {
+    if (isPListBehind()) return;
+    const Ref<URL> mark = markOfPListBehind();
+    const Ref<Data> nothing = Data::adopt(std::string());
+    NetError error;
+    if (nothing->writeToResource(mark, error)) return;
+    gWarn.log("Could not write %@ : %@", mark, error);
+}
+
+void unmarkPListBehind() {
+    if (!isPListBehind()) return;
+    const Ref<URL> mark = markOfPListBehind();
+    NetError error;
+    // The next start then saves once more.
+    if (!FileUtils::deleteFile(mark, error)) gWarn.log("Unable to delete <%@>: %@", mark, error);
 }
 
 URLReturner withSuffix(const URL& url, const char* suffix) {
@@ -133,6 +163,7 @@ void MinistryOfTruth::openDatabase() {
     } else {
         openNewDatabase();
     }
+    callGuarded("void Orvane::MinistryOfTruth::openDatabase()", [] { TruthRemoval::finish(); });
     // What migrated or restored it is not announced.
     gDatabase->setPostsNotifications(true);
     mPostsNotifications = true;
@@ -158,7 +189,7 @@ void MinistryOfTruth::openExistingDatabase() {
     const Ref<URL> plist = getClientPListURL();
     if (reason) {
         recoverBrokenDatabase(reason);
-    } else if (!FileUtils::exists(plist)) {
+    } else if (!FileUtils::exists(plist) || isPListBehind()) {
         saveSubscriptionsSoon();
     }
 }
@@ -264,6 +295,7 @@ void MinistryOfTruth::deleteDatabase() {
 void MinistryOfTruth::saveSubscriptionsSoon() {
     if (mSaveTimer.isRunning()) return;
     gLogTruth.log("Will save client/subscription info plist in 5 sec...");
+    markPListBehind();
     mSaveTimer.start(kSaveDelaySeconds, false);
 }
 
@@ -272,7 +304,7 @@ void MinistryOfTruth::saveSubscriptions() {
     mSaveTimer.stop();
     const Ref<URL> url = getClientPListURL();
     const Ref<Dictionary> root = ClientsPlist::describeDatabase();
-    ClientsPlist::write(root, url);
+    if (ClientsPlist::write(root, url)) unmarkPListBehind();
 }
 
 URLReturner MinistryOfTruth::getClientPListURL() {
@@ -280,15 +312,7 @@ URLReturner MinistryOfTruth::getClientPListURL() {
 }
 
 void MinistryOfTruth::deleteTruthDirectoryForFeed(FeedCore* feed, URL* directory) {
-    if (!directory) return;
-    const Ref<String> extension = String::stringWithFormat("deleted.at.%f", Clock::current().now());
-    const Ref<URL> renamed = directory->byAppendingExtension(extension);
-    NetError error;
-    if (FileUtils::move(directory, renamed, error)) {
-        FileUtils::asyncDeleteDirectory(renamed);
-    } else {
-        gWarn.log("Could not take the directory %@ of %@ away: %@", directory, feed, error);
-    }
+    if (directory) TruthRemoval::remove(feed, directory);
 }
 
 }  // namespace Orvane

@@ -15,6 +15,7 @@ class FeedCore;
 ///
 ///     Orvane/Database/Database.sqlite3   the database; its directory goes as a whole
 ///     Orvane/Clients.plist               see `ClientsPlist`
+///     Orvane/.clients-changed            there while that is still to be saved
 ///     Orvane/Feeds/<feed>.xml            a feed's last document
 ///     Orvane/Feeds/<feed>/<entry>.xml    an entry that is no longer in it
 ///
@@ -30,7 +31,9 @@ class MinistryOfTruth : Foundation::Uncopyable {
     static MinistryOfTruth* instance();
 
     /// Opens the database of the process for writing, and makes it, migrates it or makes it anew as
-    /// need be. From then on its changes are announced. To be called once.
+    /// need be. Takes up what an earlier process did not come to: the file of clients and
+    /// subscriptions, and directories that were to be deleted. From then on changes of the database
+    /// are announced. To be called once.
     ///
     /// Throws `NetException` if a directory cannot be made, or a database that is broken not be
     /// moved away, and what making it anew throws: that is taken up again the next time.
@@ -39,14 +42,15 @@ class MinistryOfTruth : Foundation::Uncopyable {
     void recoverBrokenDatabase(String* reason);
 
     /// Saves the file of clients and subscriptions in 5 seconds, or when an earlier request said.
+    /// A process that ends before leaves that to the next one's start.
     void saveSubscriptionsSoon();
     /// Saves it now. That it cannot be written draws a warning. Throws `SQLite::Exception`.
     void saveSubscriptions();
     static Foundation::URLReturner getClientPListURL();
 
-    /// Takes the directory with the feed's saved entries away at once and deletes it on the thread
-    /// of `FileDeletionQueue`, so that no transaction waits for a big one, and a feed that is added
-    /// again finds none. `directory` may be null: there is none then.
+    /// Takes the directory with the feed's saved entries away at once and deletes it by and by, so
+    /// that no transaction waits for a big one, and a feed that is added again finds none; see
+    /// `TruthRemoval`. `directory` may be null: there is none then.
     void deleteTruthDirectoryForFeed(FeedCore* feed, URL* directory);
 
     /// Whether a new database is being filled with what there was in an earlier one. The documents

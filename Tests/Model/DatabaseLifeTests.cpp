@@ -211,6 +211,19 @@ TEST_F(DatabaseLifeTest, SavesTheClientsOfOneThatHasNoFileOfThem) {
     EXPECT_EQ(log.count("Will save client/subscription info plist"), 1);
 }
 
+TEST_F(DatabaseLifeTest, SavesTheClientsThatAnEarlierProcessDidNotComeTo) {
+    makeCurrent();
+    writeFile("Clients.plist", kPlist);
+    writeFile(".clients-changed", "");
+    start();
+    EXPECT_EQ(log.count("Will save client/subscription info plist"), 1);
+    clock.advanceBy(5);
+    EXPECT_THAT(readFile("Clients.plist"), HasSubstr("com.example.reader"));
+    EXPECT_FALSE(has(".clients-changed"));
+    restart();
+    EXPECT_FALSE(log.contains("Will save"));
+}
+
 TEST_F(DatabaseLifeTest, DoesNotSaveTheClientsOfANewOne) {
     start();
     clock.advanceBy(60);

@@ -7,6 +7,8 @@
 #include "Support/ChildProcess.h"
 #include "Support/EnvVar.h"
 #include "Support/PipedChild.h"
+#include "Support/TurnUntil.h"
+#include "Utilities/FileUtils.h"
 
 #include <gmock/gmock.h>
 
@@ -41,13 +43,31 @@ class MinistryKill : public TruthTest {
     bool openAndKillAfter(int microseconds) const {
         Support::PipedChild child({MINISTRY_WORKER, "open", base.path()});
         EXPECT_EQ(child.readLine(), "ready");
-        const auto end = Clock::now() + std::chrono::microseconds(microseconds);
-        while (Clock::now() < end) {
-        }
+        waitFor(microseconds);
         child.kill();
         const bool isDone = child.readLine() == "done";
         child.wait();
         return isDone;
+    }
+    static void waitFor(int microseconds) {
+        const auto end = Clock::now() + std::chrono::microseconds(microseconds);
+        while (Clock::now() < end) {
+        }
+    }
+    /// Kills a worker that works for ever, at some moment behind one of its first lines. Gives the
+    /// lines that it has written.
+    Strings workAndKill(const char* mode, int mostLines) {
+        Support::PipedChild child({MINISTRY_WORKER, mode, base.path()});
+        Strings lines;
+        for (int left = between(1, mostLines); left > 0; --left) {
+            lines.push_back(child.readLine());
+        }
+        waitFor(between(0, 3000));
+        child.kill();
+        for (std::string line; !(line = child.readLine()).empty();) {
+            lines.push_back(line);
+        }
+        return lines;
     }
     /// How many microseconds the worker needs if nobody kills it.
     int timeToOpen() const {
@@ -91,6 +111,29 @@ class MinistryKill : public TruthTest {
         db().integrityCheck();
         EXPECT_EQ(db().getUserVersion(), 10022);
         EXPECT_EQ(db().execScalar("PRAGMA auto_vacuum"), 2);
+    }
+
+    int subscriptionsInPlist() const {
+        const Ref<Dictionary> root = ClientsPlist::read(urlOf("Clients.plist"));
+        if (!root) return -1;
+        const auto* subscriptions = root->getAs<Dictionary>("Subscriptions");
+        EXPECT_EQ(root->getAs<Dictionary>("Feeds")->count(), subscriptions->count());
+        return static_cast<int>(subscriptions->count());
+    }
+    /// How many files there are in directories, which are all of stored feeds.
+    int filesOfOldEntries() const {
+        int files = 0;
+        for (const auto& item : fs::directory_iterator(storage() / "Feeds")) {
+            if (!item.is_directory()) continue;
+            const std::string identifier = item.path().filename();
+            EXPECT_EQ(db().execScalar("select count(*) from Feeds where identifier=%Q",
+                                      identifier.c_str()),
+                      1)
+                << identifier;
+            const fs::directory_iterator saved(item);
+            files += static_cast<int>(std::distance(begin(saved), end(saved)));
+        }
+        return files;
     }
 
     const unsigned seed = std::random_device()();
@@ -154,38 +197,61 @@ TEST_F(MinistryKill, OfARebuildLosesNothingMore) {
 TEST_F(MinistryKill, OfASaveLosesNoAcknowledgedSubscription) {
     int committed = 0, saved = 0;
     for (int i = 0; i < kills(); ++i) {
-        {
-            Support::PipedChild child({MINISTRY_WORKER, "subscribe", base.path()});
-            const int lines = between(1, 12);
-            std::string line = child.readLine();
-            const auto note = [&] {
-                std::sscanf(line.c_str(), "committed %d", &committed);
-                std::sscanf(line.c_str(), "saved %d", &saved);
-            };
-            for (int n = 0; n < lines; ++n) {
-                line = child.readLine();
-                note();
-            }
-            const auto end = Clock::now() + std::chrono::microseconds(between(0, 3000));
-            while (Clock::now() < end) {
-            }
-            child.kill();
-            while (!(line = child.readLine()).empty())
-                note();
-            ASSERT_EQ(child.wait(), -1) << "it ended by itself";
+        for (const std::string& line : workAndKill("subscribe", 12)) {
+            std::sscanf(line.c_str(), "committed %d", &committed);
+            std::sscanf(line.c_str(), "saved %d", &saved);
         }
         start();
         const int stored = count("Subscriptions");
         ASSERT_TRUE(stored == committed || stored == committed + 1) << stored << ' ' << committed;
         if (saved > 0) {
-            const Ref<Dictionary> root = ClientsPlist::read(urlOf("Clients.plist"));
-            ASSERT_TRUE(root);
-            const auto count = static_cast<int>(root->getAs<Dictionary>("Subscriptions")->count());
+            const int count = subscriptionsInPlist();
             ASSERT_GE(count, saved);
             ASSERT_LE(count, stored);
-            EXPECT_EQ(root->getAs<Dictionary>("Feeds")->count(), static_cast<std::size_t>(count));
         }
         committed = stored;
+        db().close(false);
+    }
+}
+
+TEST_F(MinistryKill, BeforeASaveThatIsDueLeavesItToTheNextStart) {
+    int committed = 0;
+    for (int i = 0; i < kills(); ++i) {
+        for (const std::string& line : workAndKill("request", 12)) {
+            std::sscanf(line.c_str(), "committed %d", &committed);
+        }
+        start();
+        const int stored = count("Subscriptions");
+        ASSERT_TRUE(stored == committed || stored == committed + 1) << stored << ' ' << committed;
+        clock.advanceBy(MinistryOfTruth::kSaveDelaySeconds);
+        ASSERT_GE(committed > 0 ? subscriptionsInPlist() : 0, committed);
+        committed = stored;
+        db().close(false);
+    }
+}
+
+TEST_F(MinistryKill, OfADeletionTakesAFeedsOldEntriesWithItOrLeavesThemAll) {
+    constexpr int kFeeds = 12;
+    makeTruth(kFeeds);
+    const fs::path original = base / "original";
+    fs::rename(storage(), original);
+    for (int i = 0; i < kills(); ++i) {
+        fs::remove_all(storage());
+        fs::copy(original, storage(), fs::copy_options::recursive);
+        int deleted = 0;
+        for (const std::string& line : workAndKill("delete", kFeeds)) {
+            if (line.starts_with("deleted ")) ++deleted;
+        }
+        start();
+        const int left = count("Feeds");
+        ASSERT_TRUE(left == kFeeds - deleted || left == kFeeds - deleted - 1)
+            << left << ' ' << deleted;
+        ASSERT_EQ(count("Subscriptions"), left);
+        ASSERT_EQ(count("Entries"), left * (kCurrentEntries + kOldEntries));
+        ASSERT_TRUE(Support::turnUntil([] { return !FileUtils::isDeletingFilesAsynchronously(); }));
+        ASSERT_EQ(filesOfOldEntries(), left * kOldEntries);
+        clock.advanceBy(MinistryOfTruth::kSaveDelaySeconds);
+        ASSERT_EQ(subscriptionsInPlist(), left);
         db().close(false);
     }
 }

@@ -1,6 +1,7 @@
 #include "Model/MinistryOfTruth.h"
 
 #include "Model/StorageTest.h"
+#include "Support/FileAccess.h"
 #include "Support/TurnUntil.h"
 #include "Utilities/FileUtils.h"
 
@@ -24,6 +25,15 @@ class TruthDirectoryTest : public StorageTest {
     static void waitUntilDeleted() {
         // The queue opens a pool for a warning, which waits for the test's.
         ASSERT_TRUE(Support::turnUntil([] { return !FileUtils::isDeletingFilesAsynchronously(); }));
+    }
+    /// Stores a feed with an entry, and closes the database.
+    static void makeFeed(const char* identifier, bool isEntryCurrent) {
+        ministry().openDatabase();
+        db().execute("insert into Feeds (identifier, url) values (%Q, %Q)", identifier, identifier);
+        db().execute(
+            "insert into Entries (feed, current) select rowID, %d from Feeds where identifier=%Q",
+            isEntryCurrent ? 1 : 0, identifier);
+        db().close(true);
     }
 };
 
@@ -53,6 +63,45 @@ TEST_F(SavingTest, ASaveTakesTheLaterOnesPlace) {
     EXPECT_EQ(log.count("Saving client/subscription info plist"), 2);
 }
 
+TEST_F(SavingTest, LeavesAMarkUntilItIsDone) {
+    ministry().saveSubscriptionsSoon();
+    EXPECT_TRUE(has(".clients-changed"));
+    ministry().saveSubscriptionsSoon();
+    clock.advanceBy(5);
+    EXPECT_TRUE(has("Clients.plist"));
+    EXPECT_FALSE(has(".clients-changed"));
+}
+
+TEST_F(SavingTest, LeavesTheMarkIfItFails) {
+    ministry().saveSubscriptionsSoon();
+    {
+        const Support::FileSizeLimit full(16);
+        ministry().saveSubscriptions();
+    }
+    EXPECT_EQ(log.count("Could not write file://"), 1);
+    EXPECT_TRUE(has(".clients-changed"));
+    ministry().saveSubscriptions();
+    EXPECT_FALSE(has(".clients-changed"));
+}
+
+TEST_F(SavingTest, GoesOnWhereItCanLeaveNoMark) {
+    std::filesystem::remove(storage());
+    ministry().saveSubscriptionsSoon();
+    EXPECT_EQ(log.count("Could not write file://"), 1);
+    std::filesystem::create_directory(storage());
+    clock.advanceBy(5);
+    EXPECT_TRUE(has("Clients.plist"));
+    EXPECT_EQ(log.count("Unable to delete"), 0);
+}
+
+TEST_F(SavingTest, GoesOnWhereItCannotTakeTheMarkOff) {
+    std::filesystem::create_directory(storage() / ".clients-changed");
+    ministry().saveSubscriptionsSoon();
+    clock.advanceBy(5);
+    EXPECT_TRUE(has("Clients.plist"));
+    EXPECT_EQ(log.count("Unable to delete <file://"), 1);
+}
+
 TEST_F(TruthDirectoryTest, IsTakenAwayAtOnceAndDeleted) {
     writeFile("Feeds/abc/1.xml", "<item/>");
     writeFile("Feeds/abcd/1.xml", "<item/>");
@@ -73,6 +122,33 @@ TEST_F(TruthDirectoryTest, HasTheTimeInTheNameThatItIsDeletedUnder) {
     EXPECT_TRUE(has("Feeds/abc/1.xml"));
     EXPECT_EQ(log.count("Could not take the directory file://"), 1);
     EXPECT_FALSE(FileUtils::isDeletingFilesAsynchronously());
+}
+
+TEST_F(TruthDirectoryTest, IsDeletedByTheNextStartIfItWasLeft) {
+    writeFile("Feeds/abc.deleted.at.5.000000/1.xml", "<item/>");
+    writeFile("Feeds/abc/2.xml", "<item/>");
+    writeFile("Feeds/note.deleted.at.5.000000", "no directory");
+    makeFeed("abc", false);
+    makeFeed("def", true);
+    writeFile("Feeds/def.deleted.at.5.000000/1.xml", "<item/>");
+    ministry().openDatabase();
+    waitUntilDeleted();
+    EXPECT_FALSE(has("Feeds/abc.deleted.at.5.000000"));
+    EXPECT_FALSE(has("Feeds/def.deleted.at.5.000000"));
+    EXPECT_FALSE(has("Feeds/def"));
+    EXPECT_TRUE(has("Feeds/abc/2.xml"));
+    EXPECT_TRUE(has("Feeds/note.deleted.at.5.000000"));
+}
+
+TEST_F(TruthDirectoryTest, ComesBackWhereTheDeletionOfItsFeedWasNotCommitted) {
+    makeFeed("abc", false);
+    writeFile("Feeds/abc.deleted.at.5.000000/1.xml", "<item/>");
+    writeFile("Feeds/abc.deleted.at.6.000000/2.xml", "<item/>");
+    ministry().openDatabase();
+    waitUntilDeleted();
+    EXPECT_EQ(readFile("Feeds/abc/1.xml"), "<item/>");
+    EXPECT_FALSE(has("Feeds/abc.deleted.at.5.000000"));
+    EXPECT_FALSE(has("Feeds/abc.deleted.at.6.000000"));
 }
 
 TEST_F(TruthDirectoryTest, MayBeNone) {

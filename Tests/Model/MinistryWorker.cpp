@@ -7,13 +7,21 @@
 //                                   subscription of the next number, to the feed of that number,
 //                                   and writes "committed NUMBER"; then saves the file of clients
 //                                   and writes "saved NUMBER"
+//   ministry_worker request BASE    the same, but only asks for the file to be saved soon, before
+//                                   it writes "committed NUMBER"
+//   ministry_worker delete BASE     opens it and deletes the subscriptions one after the other, and
+//                                   with each its feed, and writes "deleted ROWID" for each, and
+//                                   "done"
 
+#include "Foundation/ArrayOf.h"
 #include "Foundation/Switches.h"
 #include "Foundation/URL.h"
 #include "Model/LineFeeding.h"
 #include "Model/MinistryOfTruth.h"
+#include "Model/SubscriptionCore.h"
 #include "SQLite/Database.h"
 #include "SQLite/FakeCenter.h"
+#include "SQLite/TableOf.h"
 #include "SQLite/Transaction.h"
 #include "Support/LogCapture.h"
 #include "Utilities/FileSystem.h"
@@ -46,16 +54,34 @@ void subscribe(int number) {
                        number);
 }
 
-[[noreturn]] void subscribeForEver() {
+[[noreturn]] void subscribeForEver(bool onlyRequests) {
     int number = gDatabase->execScalar("select count(*) from Subscriptions");
     for (;;) {
         const AutoreleasePool pool;
         ++number;
         subscribe(number);
+        if (onlyRequests) MinistryOfTruth::instance()->saveSubscriptionsSoon();
         say("committed " + std::to_string(number));
+        if (onlyRequests) continue;
         MinistryOfTruth::instance()->saveSubscriptions();
         say("saved " + std::to_string(number));
     }
+}
+
+void deleteSubscriptions() {
+    const auto query = SQLite::TableOf<SubscriptionCore>::instance()->allRows();
+    const Ref<ArrayOf<SubscriptionCore>> subscriptions = query->allRows();
+    for (SubscriptionCore* subscription : *subscriptions) {
+        const AutoreleasePool pool;
+        const SQLite::RowID rowID = subscription->getRowID();
+        subscription->deleteRow();
+        say("deleted " + std::to_string(rowID));
+    }
+}
+
+void work(const std::string& mode) {
+    if (mode == "subscribe" || mode == "request") subscribeForEver(mode == "request");
+    if (mode == "delete") deleteSubscriptions();
 }
 
 void useStorage(const char* path) {
@@ -77,7 +103,7 @@ int main(int argc, char** argv) {
         useStorage(argv[2]);
         say("ready");
         MinistryOfTruth::instance()->openDatabase();
-        if (std::string(argv[1]) == "subscribe") subscribeForEver();
+        work(argv[1]);
         say("done");
         gDatabase->close(true);
         return 0;
