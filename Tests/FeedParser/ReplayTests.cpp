@@ -1,7 +1,6 @@
 // The documents of a feed, one after the other, from their bytes to the rows and files.
 
-#include "FeedParser/MergeTest.h"
-#include "FeedParser/ParserPort.h"
+#include "FeedParser/ReplayTest.h"
 #include "Foundation/ArrayOf.h"
 
 using namespace Foundation;
@@ -10,41 +9,7 @@ using namespace SQLite;
 
 namespace {
 
-struct Item {
-    std::string guid;
-    std::string title = "Title";
-    std::string date = "Tue, 06 Jun 2006 10:00:00 GMT";
-    int length = 0;  ///< of its enclosure; none for 0
-};
-
-class Replay : public MergeTest {
- protected:
-    Replay() { DocumentParser::setCurrent(&parser); }
-    ~Replay() noexcept override { DocumentParser::setCurrent(nullptr); }
-
-    static std::string XMLOf(const Item& item) {
-        std::string xml = "<item><title>" + item.title + "</title><guid>" + item.guid +
-                          "</guid><pubDate>" + item.date + "</pubDate>" + "<description>Text of " +
-                          item.guid + "</description>";
-        if (item.length != 0) {
-            xml += "<enclosure url=\"http://example.org/a.mp3\" type=\"audio/mpeg\" length=\"" +
-                   std::to_string(item.length) + "\"/>";
-        }
-        return xml + "</item>";
-    }
-    /// Parses and merges the document of these items.
-    std::string read(const std::vector<Item>& items) {
-        std::string xml = "<rss version=\"2.0\"><channel><title>News</title>";
-        for (const Item& item : items) {
-            xml += XMLOf(item);
-        }
-        FeedCore* parsed = FeedCore::createFeed(data(xml + "</channel></rss>"), url(kAddress));
-        parsed->mURL.setValue(url(kAddress));
-        return merge(parsed);
-    }
-
-    FeedParser::ParserPort parser;
-};
+class Replay : public ReplayTest {};
 
 }  // namespace
 
@@ -106,6 +71,19 @@ TEST_F(Replay, OfAGhostThatItsFeedBrings) {
 TEST_F(Replay, OfOneGUIDForTwoEntries) {
     EXPECT_EQ(read({{"a", "One"}, {"a", "Two"}}), "changed 0 1 0");
     EXPECT_EQ(titles(), "One ");
+}
+
+TEST_F(Replay, OfTheSameSourceUnderTwoGUIDs) {
+    EXPECT_EQ(read({{"a", "One"}}), "changed 0 1 0");
+    FeedCore* parsed = parse({{"a", "One"}, {"b", "Two"}});
+    const auto& rows = parsed->mEntries.getNewRows();
+    static_cast<EntryCore&>(*rows[1]).setXMLRepresentation(
+        static_cast<EntryCore&>(*rows[0]).getXMLRepresentation());
+    EXPECT_EQ(merge(parsed), "same 0 0 0");
+    EXPECT_EQ(stateOf("b"), "none");
+    // It comes once it has a source of its own.
+    EXPECT_EQ(read({{"a", "One"}, {"b", "Two"}}), "changed 0 1 0");
+    EXPECT_EQ(stateOf("b"), "current");
 }
 
 TEST_F(Replay, BringsArchivedEntriesBackFromTheirFiles) {
