@@ -3,6 +3,9 @@
 #include "Support/DefaultZone.h"
 #include "Utilities/XMLElement.h"
 
+#include <libxml/parser.h>
+#include <libxml/xmlmemory.h>
+
 using namespace Foundation;
 using namespace Orvane;
 using namespace SQLite;
@@ -17,6 +20,32 @@ constexpr const char* kEntry =
     "<link rel='via' href='http://via.org/'/><published>2005-01-01T00:00:00Z</published>"
     "<updated>2005-01-01T00:00:00Z</updated><content>Old</content><summary>Old</summary>"
     "<x:more>kept</x:more><x:title>kept too</x:title></entry>";
+
+/// libxml2 has no memory for a parser while this lives.
+class NoParsers {
+ public:
+    NoParsers() {
+        xmlMemGet(&sFree, &sAllocate, &sReallocate, &sCopy);
+        xmlMemSetup(sFree, allocate, sReallocate, sCopy);
+        xmlSetStructuredErrorFunc(nullptr, [](void*, xmlError*) {});
+    }
+    ~NoParsers() {
+        xmlMemSetup(sFree, sAllocate, sReallocate, sCopy);
+        xmlSetStructuredErrorFunc(nullptr, nullptr);
+    }
+    NoParsers(const NoParsers&) = delete;
+    NoParsers& operator=(const NoParsers&) = delete;
+
+ private:
+    static void* allocate(std::size_t size) {
+        return size == sizeof(xmlParserCtxt) ? nullptr : sAllocate(size);
+    }
+
+    static inline xmlFreeFunc sFree;
+    static inline xmlMallocFunc sAllocate;
+    static inline xmlReallocFunc sReallocate;
+    static inline xmlStrdupFunc sCopy;
+};
 
 class EntryXMLTest : public EntryTest {
  protected:
@@ -129,6 +158,22 @@ TEST_F(EntryXMLTest, WritesXHTMLAsElements) {
                                    "<title/><id>abc</id><content type=\"xhtml\">"
                                    "<div xmlns=\"http://www.w3.org/1999/xhtml\">"
                                    "<p>a</p><p>b</p></div></content></entry>");
+}
+
+TEST_F(EntryXMLTest, WritesXHTMLThatCannotBeReadAsHTML) {
+    const Ref<EntryCore> entry = entryWith(kEmpty);
+    entry->setContentColumn("content", str("application/xhtml+xml"), bytes("<p>a</p>"));
+    entry->setContentColumn("summary", str("application/xhtml+xml"), bytes(""));
+    const Ref<XMLElement> element = entry->_parseXMLRepresentation();
+    LogCapture log;
+    {
+        const NoParsers noParsers;
+        entry->_updateAtomXML(*element, false);
+    }
+    EXPECT_EQ(flat(element), start +
+                                 "<title/><id>abc</id>"
+                                 "<content type=\"html\">&lt;p&gt;a&lt;/p&gt;</content></entry>");
+    EXPECT_EQ(log.count("Exception parsing XML: std::bad_alloc"), 2);
 }
 
 TEST_F(EntryXMLTest, LeavesOutXHTMLWithNothingInIt) {
