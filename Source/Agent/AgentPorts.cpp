@@ -4,9 +4,11 @@ namespace Orvane {
 
 AgentPorts::AgentPorts() {
     DocumentParser::setCurrent(&mParser);
+    Housekeeping::setCurrent(&mHousekeeping);
 }
 
 AgentPorts::~AgentPorts() {
+    Housekeeping::setCurrent(nullptr);
     DocumentParser::setCurrent(nullptr);
 }
 

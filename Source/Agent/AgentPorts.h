@@ -1,5 +1,6 @@
 #pragma once
 
+#include "Agent/AgentHousekeeping.h"
 #include "FeedParser/ParserPort.h"
 #include "Foundation/Uncopyable.h"
 
@@ -13,6 +14,7 @@ class AgentPorts : Foundation::Uncopyable {
 
  private:
     FeedParser::ParserPort mParser;
+    AgentHousekeeping mHousekeeping;
 };
 
 }  // namespace Orvane

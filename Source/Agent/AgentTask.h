@@ -106,6 +106,8 @@ class AgentTask : public Foundation::RefCounted {
 
     // For tests.
 
+    /// Both intervals are read anew.
+    static void _forgetIntervals();
     std::int32_t getRefreshCount() const { return mRefreshCount; }
     std::int32_t getDownloadCount() const { return mDownloadCount; }
     double getHoldOffUntil() const { return mHoldOffUntil; }
@@ -126,6 +128,11 @@ class AgentTask : public Foundation::RefCounted {
     void observeSystem();
     void stopObserving();
     void closeDatabase();
+
+    bool isHeldOff() const;
+    void runHygieneTasks();
+    static bool canExpire();
+    void noteHygieneRun();
 
     bool isBusy() const;
     void findNextWork(double& seconds) const;
