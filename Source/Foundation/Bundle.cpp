@@ -65,6 +65,10 @@ Bundle* Bundle::frameworkBundle() {
     return sBundle;
 }
 
+StringReturner Bundle::frameworkVersion() {
+    return String::string(ORVANE_VERSION);
+}
+
 Returner<Bundle> Bundle::bundle(const std::string& directory, const std::string& textDomain) {
     return Returner<Bundle>(new Bundle(directory, textDomain, Texts::Translated));
 }

@@ -15,6 +15,8 @@ class Bundle : public PFRefCounted {
     /// The library's own: `$ORVANE_RESOURCES` or else where the library is installed. Its texts
     /// are the domain "orvane", and English where there is no translation.
     static Bundle* frameworkBundle();
+    /// The version of the library: "1.0.2".
+    static StringReturner frameworkVersion();
     /// A bundle of somebody else's. Its translations are those of `textDomain` in the directory
     /// "locale" beside its own.
     static Returner<Bundle> bundle(const std::string& directory, const std::string& textDomain);

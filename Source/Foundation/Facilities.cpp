@@ -35,6 +35,7 @@ constinit Foundation::Logger gLogAgentVerbose{"Agent.Verbose", 0};
 constinit Foundation::Logger gLogRender{"Render", 1};
 constinit Foundation::Logger gLogRenderOut{"RenderOut", 0};
 constinit Foundation::Logger gLogHTTP{"HTTP", 0};
+constinit Foundation::Logger gLogQueue{"Queue", 0};
 constinit Foundation::Logger gLogIPC{"IPC", 1};
 namespace Lua {
 constinit Foundation::Logger gLogLua{"Lua", 0};

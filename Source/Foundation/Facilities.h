@@ -12,7 +12,7 @@ extern Foundation::Logger gLogSQL, gLogPersist, gLogTruth;
 namespace Orvane {
 extern Foundation::Logger gLogParser, gLogParserVerbose, gLogParserDates, gLogDownload, gLogSub,
     gLogFeed, gLogSocket, gLogSCGI, gLogSCGIVerbose, gLogAPI, gLogAPIVerbose, gLogAgent,
-    gLogAgentVerbose, gLogRender, gLogRenderOut, gLogHTTP, gLogIPC;
+    gLogAgentVerbose, gLogRender, gLogRenderOut, gLogHTTP, gLogQueue, gLogIPC;
 namespace Lua {
 extern Foundation::Logger gLogLua;
 }  // namespace Lua

@@ -47,6 +47,7 @@ const Facility kFacilities[] = {
     {Orvane::gLogRender, "Render", 1},
     {Orvane::gLogRenderOut, "RenderOut", 0},
     {Orvane::gLogHTTP, "HTTP", 0},
+    {Orvane::gLogQueue, "Queue", 0},
     {gLogTidier, "Tidier", 0},
     {gLogTidierVerbose, "TidierVerbose", 0},
     {Orvane::gLogIPC, "IPC", 1},

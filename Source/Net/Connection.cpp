@@ -1,0 +1,214 @@
+#include "Net/Connection.h"
+
+#include "Foundation/AssertionFailure.h"
+#include "Foundation/Clock.h"
+#include "Foundation/Logger.h"
+#include "Net/ConnectionLimits.h"
+#include "Net/ConnectionService.h"
+
+#include <utility>
+
+namespace Orvane {
+
+using Foundation::NetError;
+using Foundation::Ref;
+using Foundation::Returner;
+
+Connection::Connection(const ConnectionRequest* request, ConnectionClient* client)
+    : mService(ConnectionService::shared()),
+      mClient(client),
+      mRequest(request->copy()),
+      mBeginTimer(this, &Connection::begin),
+      mStallTimer(this, &Connection::timedOut),
+      mTotalTimer(this, &Connection::tookTooLong) {}
+
+Returner<Connection> Connection::connection(const ConnectionRequest* request,
+                                            ConnectionClient* client) {
+    OV_ASSERT(request);
+    OV_ASSERT(client);
+    return Returner<Connection>::adopted(new Connection(request, client));
+}
+
+Connection::~Connection() {
+    close();
+}
+
+void Connection::schedule() {
+    mIsScheduled = true;
+    beginIfReady();
+}
+
+void Connection::start() {
+    mIsStarted = true;
+    beginIfReady();
+}
+
+void Connection::beginIfReady() {
+    if (mIsScheduled && mIsStarted && mPhase == Phase::New) mBeginTimer.start(0.0, false);
+}
+
+void Connection::begin() {
+    const Ref<Connection> self(this);
+    if (mPhase == Phase::Declined) return deliverHeld();
+    const Ref<ConnectionRequest> request = mClient->willSendRequest(mRequest, nullptr);
+    if (!mClient) return;
+    if (!request) return fail(NetError(NetError::kPFURL, OVURLErrorCancelled));
+    mRequest = request->copy();
+    send();
+}
+
+/// Asks the server that the request names.
+void Connection::send() {
+    mPhase = Phase::Asking;
+    const Foundation::URL& url = *mRequest->getURL();
+    if (!url.isScheme("http") && !url.isScheme("https")) {
+        return fail(NetError(NetError::kPFURL, OVURLErrorUnsupportedURL));
+    }
+    startExchange();
+}
+
+void Connection::startExchange() {
+    ExchangeRequest request;
+    request.message = Ref<HTTPMessage>(&mRequest->message());
+    request.acceptsCodings = mRequest->isDocument();
+    request.handlesCookies = mRequest->handlesCookies();
+    mSentLogin = mayUseLogin();
+    if (mSentLogin) {
+        request.credential = mLogin->credential;
+        request.method = mLogin->method;
+    }
+    restartTimers();
+    mExchange = mService.transport().start(request, *this, std::move(mExchange));
+}
+
+bool Connection::mayUseLogin() const {
+    return mLogin && !mSteppedDown && mLogin->origin == Origin::of(*mRequest->getURL());
+}
+
+void Connection::restartTimers() {
+    mStallTimer.start(mRequest->getTimeout(), false);
+    if (mRequest->isDocument() && !mTotalTimer.isRunning()) {
+        mTotalTimer.start(ConnectionLimits::kMaxDocumentSeconds, false);
+    }
+}
+
+void Connection::moved() {
+    mIsLastChance = false;
+    if (mStallTimer.isRunning()) mStallTimer.start(mRequest->getTimeout(), false);
+}
+
+void Connection::gotHead(ExchangeHead head) {
+    const Ref<Connection> self(this);
+    moved();
+    const Ref<HTTPMessage> message = HTTPMessage::response(head.status, std::move(head.headers));
+    const Ref<ConnectionResponse> response = ConnectionResponse::response(
+        &mRequest->message(), message, Foundation::Clock::current().now());
+    if (followRedirect(response) || askForLogin(response)) return;
+    if (mClient) deliver(response);
+}
+
+void Connection::gotBody(std::string_view block) {
+    const Ref<Connection> self(this);
+    moved();
+    switch (mPhase) {
+        case Phase::Skipping:
+            mSkippedBytes += block.size();
+            if (mSkippedBytes > ConnectionLimits::kMaxIgnoredBytes) {
+                mExchange.reset();
+                sendNext();
+            }
+            break;
+        case Phase::Challenged:
+        case Phase::Declined:
+            hold(block);
+            break;
+        case Phase::Body:
+            deliverBlock(block);
+            break;
+        case Phase::New:
+        case Phase::Asking:
+            break;
+    }
+}
+
+void Connection::ended(const ExchangeEnd& end) {
+    const Ref<Connection> self(this);
+    switch (mPhase) {
+        case Phase::Skipping:
+            // Its head was whole, which is all that was wanted of it.
+            if (!end.isWhole()) mExchange.reset();
+            return sendNext();
+        case Phase::Challenged:
+        case Phase::Declined:
+            mHeldEnd = end;
+            return;
+        case Phase::New:
+        case Phase::Asking:
+        case Phase::Body:
+            break;
+    }
+    if (end.failure) return fail(end.failure.get());
+    if (end.error.code != 0) return fail(end.error);
+    if (mPhase != Phase::Body) return fail(NetError(NetError::kPFURL, OVURLErrorBadServerResponse));
+    finishBody();
+}
+
+void Connection::deliver(ConnectionResponse* response) {
+    mPhase = Phase::Body;
+    mClient->didReceiveResponse(response);
+}
+
+void Connection::deliverBlock(std::string_view block) {
+    const Ref<Foundation::Data> data =
+        Foundation::Data::data(block.data(), block.size(), /*copy=*/false);
+    mClient->didReceiveData(data, static_cast<long>(block.size()));
+}
+
+void Connection::finishBody() {
+    close()->didFinishLoading();
+}
+
+/// A loop that was busy, or a machine that slept, finds this timer due before it has read what came
+/// in the meantime: the first time only lets it read.
+void Connection::timedOut() {
+    const Ref<Connection> self(this);
+    if (!std::exchange(mIsLastChance, true)) return mStallTimer.start(0.0, false);
+    if (mPhase == Phase::Skipping) {
+        mExchange.reset();
+        return sendNext();
+    }
+    Foundation::gWarn.log("<%@>: no byte in %.0f seconds", mRequest->getURL(),
+                          mRequest->getTimeout());
+    fail(NetError(NetError::kPFURL, OVURLErrorTimedOut));
+}
+
+void Connection::tookTooLong() {
+    const Ref<Connection> self(this);
+    Foundation::gWarn.log("<%@>: not complete in %.0f seconds", mRequest->getURL(),
+                          ConnectionLimits::kMaxDocumentSeconds);
+    fail(NetError(NetError::kPFURL, OVURLErrorTimedOut));
+}
+
+ConnectionClient* Connection::close() {
+    mBeginTimer.stop();
+    mStallTimer.stop();
+    mTotalTimer.stop();
+    mExchange.reset();
+    mPhase = Phase::New;
+    mIsStarted = false;
+    return std::exchange(mClient, nullptr);
+}
+
+void Connection::cancel() {
+    close();
+}
+
+void Connection::fail(NetError error) {
+    if (ConnectionClient* client = close()) client->didFail(error);
+}
+
+void Connection::fail(ConnectionError* error) {
+    if (ConnectionClient* client = close()) client->didFail(error);
+}
+
+}  // namespace Orvane

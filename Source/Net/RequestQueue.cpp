@@ -1,0 +1,53 @@
+#include "Net/RequestQueue.h"
+
+#include "Foundation/AssertionFailure.h"
+#include "Foundation/Logger.h"
+
+#include <algorithm>
+
+namespace Orvane {
+
+using Foundation::Ref;
+
+RequestQueue& RequestQueue::networkQueue() {
+    // Never destroyed: requests that end with the process leave it.
+    static auto* const sQueue = new RequestQueue(kNetworkLimit);
+    return *sQueue;
+}
+
+RequestQueue::Requests::iterator RequestQueue::find(const Request* request) {
+    return std::ranges::find(mRequests, request, &Ref<Request>::get);
+}
+
+void RequestQueue::addRequest(Request* req) {
+    OV_ASSERT(req);
+    const auto where = find(req);
+    OV_ASSERT_AS(where == mRequests.end(), "where==mRequests.end()");
+    const auto count = static_cast<unsigned>(mRequests.size());
+    mRequests.emplace_back(req);
+    if (count >= mLimit) {
+        gLogQueue.log("Added request[%u] to start later", count);
+        return;
+    }
+    gLogQueue.log("Added request[%u] and starting it", count);
+    req->startRequest();
+}
+
+void RequestQueue::removeRequest(Request* req) {
+    OV_ASSERT(req);
+    const auto where = find(req);
+    if (where == mRequests.end()) return;
+    const auto index = static_cast<unsigned>(where - mRequests.begin());
+    Ref<Request> removed = std::move(*where);
+    mRequests.erase(where);
+    gLogQueue.log("Removed request[%u] now [%d]", index, static_cast<int>(mRequests.size()));
+    if (index < mLimit && mRequests.size() >= mLimit) {
+        gLogQueue.log("Starting request[%u]", mLimit - 1);
+        const Ref<Request> next = mRequests[mLimit - 1];
+        next->startRequest();
+    }
+    // Its caller may be working in it.
+    removed = nullptr;
+}
+
+}  // namespace Orvane

@@ -1,0 +1,185 @@
+#include "Net/URLRequest.h"
+
+#include "Foundation/AssertionFailure.h"
+#include "Foundation/Guard.h"
+#include "Net/Connection.h"
+#include "Net/RequestQueue.h"
+
+namespace Orvane {
+
+using Foundation::callGuarded;
+using Foundation::NetError;
+using Foundation::Ref;
+using Foundation::Returner;
+using Foundation::String;
+using Foundation::URL;
+
+namespace {
+
+/// There was an error, and nobody knows which.
+constexpr NetError kUnknownError(NetError::kCustom, -1);
+
+bool isUnknown(const NetError& error) {
+    return error.domain == kUnknownError.domain && error.code == kUnknownError.code;
+}
+
+}  // namespace
+
+/// The barrier between the connection and the request: nothing that is thrown gets through.
+class URLRequest::Client : public ConnectionClient {
+ public:
+    explicit Client(URLRequest* request) : mOwner(request) {}
+
+    Returner<ConnectionRequest> willSendRequest(ConnectionRequest* request,
+                                                ConnectionResponse* response) noexcept override {
+        Ref<ConnectionRequest> result(request);
+        guarded(__PRETTY_FUNCTION__, [&] { result = mOwner->_willSendRequest(request, response); });
+        return result;
+    }
+    void didReceiveResponse(ConnectionResponse* response) noexcept override {
+        guarded(__PRETTY_FUNCTION__, [&] { mOwner->_didReceiveResponse(response); });
+    }
+    void didReceiveData(Foundation::Data* data, long length) noexcept override {
+        guarded(__PRETTY_FUNCTION__, [&] { mOwner->_didReceiveData(data, length); });
+    }
+    void didFinishLoading() noexcept override {
+        guarded(__PRETTY_FUNCTION__, [&] { mOwner->_didFinishLoading(); });
+    }
+    void didFail(NetError error) noexcept override {
+        guarded(__PRETTY_FUNCTION__, [&] { mOwner->_didFail(error); });
+    }
+    void didFail(ConnectionError* error) noexcept override {
+        guarded(__PRETTY_FUNCTION__, [&] { mOwner->_didFail(error); });
+    }
+    void didReceiveAuthenticationChallenge(AuthenticationChallenge* challenge) noexcept override {
+        guarded(__PRETTY_FUNCTION__,
+                [&] { mOwner->_didReceiveAuthenticationChallenge(challenge); });
+    }
+
+ private:
+    /// Keeps the request, and with it this, until the call is over.
+    template <class Body>
+    void guarded(const char* where, Body body) noexcept {
+        callGuarded(where, [&] {
+            const Ref<URLRequest> owner(mOwner);
+            body();
+        });
+    }
+
+    URLRequest* const mOwner;
+};
+
+URLRequest::URLRequest(URL* url) : mURL(url), mClient(std::make_unique<Client>(this)) {
+    OV_ASSERT(url);
+}
+
+URLRequest::~URLRequest() {
+    if (!mConnection) return;
+    Foundation::gWarn.log("%@ dealloced while connection still open!",
+                          static_cast<Foundation::RefCounted*>(this));
+    mConnection->cancel();
+}
+
+void URLRequest::start(bool priority) {
+    if (priority) {
+        gLogHTTP.log("%@: Starting as priority.", this);
+        startRequest();
+        return;
+    }
+    gLogHTTP.log("%@: Queuing...", this);
+    RequestQueue::networkQueue().addRequest(this);
+}
+
+void URLRequest::startRequest() {
+    _open(true);
+}
+
+void URLRequest::_open(bool schedule) {
+    gLogHTTP.log("%@: Open", this);
+    ConnectionRequest* request = _getRequest();
+    request->setIsDocument(mAccumulatesData);
+    mConnection = Connection::connection(request, mClient.get());
+    OV_ASSERT(mConnection);
+    if (schedule) mConnection->schedule();
+    mConnection->start();
+    if (mAccumulatesData) mResponseData = Foundation::Data::mutableData();
+    mOpened.invoke(this);
+}
+
+void URLRequest::stop() {
+    gLogHTTP.log("%@: Stop", this);
+    close();
+    RequestQueue::networkQueue().removeRequest(this);
+}
+
+void URLRequest::close() {
+    if (!mConnection) return;
+    mChallenge = nullptr;
+    const Ref<Connection> connection = std::move(mConnection);
+    connection->cancel();
+}
+
+ConnectionRequest* URLRequest::_getRequest() {
+    if (!mRequest) {
+        mRequest = ConnectionRequest::request(mURL, CachePolicy::UseProtocol, kDefaultTimeout);
+    }
+    return mRequest;
+}
+
+void URLRequest::setCachePolicy(CachePolicy policy) {
+    _getRequest()->setCachePolicy(policy);
+}
+
+Returner<ConnectionRequest> URLRequest::_willSendRequest(ConnectionRequest* request,
+                                                         ConnectionResponse*) {
+    return Returner<ConnectionRequest>::retained(request);
+}
+
+void URLRequest::_didReceiveResponse(ConnectionResponse* response) {
+    gLogHTTP.log("%@: DidReceiveResponse", this);
+    mResponse = response;
+    mGotResponse.invoke(this);
+}
+
+void URLRequest::_didReceiveData(Foundation::Data* data, long) {
+    gLogHTTP.log("%@: Received %u bytes of data", this, static_cast<unsigned>(data->getLength()));
+    if (mResponseData) {
+        mResponseData->append(data);
+    } else {
+        mResponseData = Foundation::Data::mutableData(data->asBytes());
+    }
+    mGotData.invoke(this);
+    if (!mAccumulatesData) mResponseData = nullptr;
+}
+
+void URLRequest::_didFinishLoading() {
+    gLogHTTP.log("%@: DidFinishLoading", this);
+    stop();
+    mFinished.invoke(this);
+}
+
+void URLRequest::_didFail(NetError error) {
+    if (isUnknown(error)) error = NetError(NetError::kPFURL, OVURLErrorDNSLookupFailed);
+    gLogHTTP.log("%@: DidFail (%d.%d) %@", this, static_cast<int>(error.domain), error.code, error);
+    mError = error;
+    failed();
+}
+
+void URLRequest::_didFail(ConnectionError* error) {
+    gLogHTTP.log("%@: DidFail (domain=%@, code=%i): %@", this, error->getDomain(), error->getCode(),
+                 error);
+    mError = error->toNetError();
+    if (isUnknown(mError) && error->getDomain()->view() == ConnectionError::kNetworkDomain) {
+        mError = NetError(NetError::kPFURL, error->getCode());
+    }
+    failed();
+}
+
+void URLRequest::failed() {
+    // Half of a body is none.
+    mResponseData = nullptr;
+    stop();
+    mFailed.invoke(this);
+}
+
+}  // namespace Orvane
