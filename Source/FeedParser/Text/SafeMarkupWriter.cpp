@@ -44,11 +44,16 @@ std::string nameOf(const xmlAttr* attribute) {
     return {};
 }
 
+const xmlAttr* findAttribute(const xmlNode* node, std::string_view name) {
+    const xmlAttr* attribute = node->properties;
+    while (attribute && nameOf(attribute) != name)
+        attribute = attribute->next;
+    return attribute;
+}
+
 std::string attributeOf(const xmlNode* node, std::string_view name) {
-    for (const xmlAttr* attribute = node->properties; attribute; attribute = attribute->next) {
-        if (nameOf(attribute) == name) return valueOf(attribute);
-    }
-    return {};
+    const xmlAttr* attribute = findAttribute(node, name);
+    return attribute ? valueOf(attribute) : std::string();
 }
 
 std::string_view namespaceOf(const xmlNode* node) {
@@ -201,7 +206,7 @@ void SafeMarkupWriter::writeField(const _xmlNode* node) {
     } else if (type == "checkbox" || type == "radio") {
         mOut += "<input";
         writeAttribute("type", type);
-        if (!attributeOf(node, "checked").empty()) writeAttribute("checked", "checked");
+        if (findAttribute(node, "checked")) writeAttribute("checked", "checked");
         writeAttribute("disabled", "disabled");
         mOut += " />";
     } else if (isOneOf(type, kOfText)) {

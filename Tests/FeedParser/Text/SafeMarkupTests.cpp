@@ -74,6 +74,9 @@ const Case kCases[] = {
      "<button>d</button><textarea>e</textarea><select><option>f</option><option>g</option>"
      "</select><input type=\"submit\" value=\"h\"/><input type=\"password\" value=\"i\"/></form>",
      "<div><label>a</label>bdef g h</div>"},
+    {"BoxesByPresence", "<input type=\"radio\" CHECKED=\"\"/><input type=\"radio\"/>",
+     "<input type=\"radio\" checked=\"checked\" disabled=\"disabled\" />"
+     "<input type=\"radio\" disabled=\"disabled\" />"},
     {"Boxes", "<input type=\"checkbox\" checked=\"checked\" onclick=\"x\"/>",
      "<input type=\"checkbox\" checked=\"checked\" disabled=\"disabled\" />"},
     {"ButtonsThatArePictures", "<input type=\"image\" src=\"x\" alt=\"y\"/>",
