@@ -99,7 +99,9 @@ void Bus::setUp(bool isRetry) {
     for (const auto& [id, subscription] : mSubscriptions) {
         if (!subscription->rule.empty()) askFor(subscription->rule);
     }
-    for (const std::string& name : mNames) {
+    // A copy, for a name that another has is not asked for again.
+    const std::set<std::string> names = mNames;
+    for (const std::string& name : names) {
         requestName(name);
     }
     if (isRetry) tellWatchersSoon({}, {}, {});

@@ -155,6 +155,14 @@ TEST_F(BusTest, TakesNamesAndGivesThemBack) {
     EXPECT_EQ(bus.getNameOwner(kName), "") << "a name that was refused is not taken later";
 }
 
+TEST_F(BusTest, IsRefusedANameByItsVeryFirstCall) {
+    Peer peer(daemon);
+    peer.own(kName);
+    bus.close();
+    EXPECT_FALSE(bus.requestName(kName));
+    EXPECT_EQ(bus.getNameOwner(kName), peer.name());
+}
+
 TEST_F(BusTest, TellsWhenTheOwnerOfANameChanges) {
     auto first = std::make_unique<Peer>(daemon);
     first->own(kName);
