@@ -10,7 +10,6 @@
 #include "Foundation/String.h"
 
 #include <systemd/sd-daemon.h>
-#include <systemd/sd-login.h>
 #include <unistd.h>
 
 #include <algorithm>
@@ -26,13 +25,14 @@ using namespace Foundation;
 
 namespace {
 
+constexpr const char* kService = "org.freedesktop.systemd1";
 constexpr const char* kErrorPrefix = "org.freedesktop.systemd1.";
 constexpr std::uint64_t kMicroseconds = 1000000;
 /// The timer need not be more exact, so that the machine can wake up for several things at once.
 constexpr std::uint64_t kAccuracyMicroseconds = kMicroseconds;
 
 BusMethod managerMethod(const char* member) {
-    return {.destination = "org.freedesktop.systemd1",
+    return {.destination = kService,
             .path = "/org/freedesktop/systemd1",
             .interface = "org.freedesktop.systemd1.Manager",
             .member = member,
@@ -47,6 +47,12 @@ bool isError(const BusMessage& reply, std::string_view name) {
 bool namesThisProcess(const char* variable) {
     const char* value = std::getenv(variable);
     return value && std::to_string(getpid()) == value;
+}
+
+/// Empty for an answer without.
+std::string getObjectPath(BusMessage reply) {
+    const char* path = nullptr;
+    return reply.isValid() && reply.readBasic('o', &path) ? path : std::string();
 }
 
 std::string getParentName() {
@@ -170,12 +176,23 @@ ServiceManager::Reply UserServiceManager::checkIn() {
     return {.type = Reply::kDictionary, .dictionary = reply};
 }
 
+/// As the manager itself says, since what a cgroup's path tells depends on where the manager's own
+/// begins.
 std::string UserServiceManager::getUnitStem() {
     constexpr std::string_view kSuffix = ".service";
-    char* found = nullptr;
-    if (sd_pid_get_user_unit(0, &found) < 0) return {};
-    std::string unit = found;
-    std::free(found);
+    Bus& bus = Bus::user();
+    const auto ourselves = static_cast<std::uint32_t>(getpid());
+    const BusMessage found = bus.callMethod(managerMethod("GetUnitByPID"), ourselves);
+    const std::string path = getObjectPath(found);
+    if (path.empty()) return {};
+    BusMessage answer = bus.callMethod({.destination = kService,
+                                        .path = path.c_str(),
+                                        .interface = "org.freedesktop.DBus.Properties",
+                                        .member = "Get",
+                                        .timeoutSeconds = kTimeoutSeconds},
+                                       "org.freedesktop.systemd1.Unit", "Id");
+    std::string unit;
+    if (!answer.isValid() || !answer.enter('v', "s") || !answer.read(unit)) return {};
     if (!unit.ends_with(kSuffix)) return {};
     unit.resize(unit.size() - kSuffix.size());
     return unit;

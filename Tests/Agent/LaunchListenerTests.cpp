@@ -1,0 +1,395 @@
+#include "Agent/LaunchListener.h"
+
+#include "Agent/AgentTest.h"
+#include "Agent/ServerSocket.h"
+#include "Foundation/ArrayOf.h"
+#include "Foundation/Number.h"
+#include "Foundation/RunLoop.h"
+#include "Foundation/UniqueFD.h"
+
+#include <fcntl.h>
+#include <gmock/gmock.h>
+#include <sys/socket.h>
+#include <sys/un.h>
+#include <unistd.h>
+
+#include <cerrno>
+#include <csignal>
+#include <cstring>
+#include <initializer_list>
+#include <stdexcept>
+
+using namespace Foundation;
+using namespace Orvane;
+using testing::ElementsAre;
+using testing::IsEmpty;
+using Reply = ServiceManager::Reply;
+using Values = MutableDictionaryOf<String, PFRefCounted>;
+using Strings = std::vector<std::string>;
+
+namespace {
+
+/// Keeps the connections that it is given.
+class FakeServer : public ServerSocket {
+ public:
+    void accept(int connection) override {
+        connections.emplace_back(connection);
+        if (throws) throw std::runtime_error("full");
+    }
+    std::vector<UniqueFD> connections;
+    bool throws = false;
+};
+
+class LaunchListenerTest : public testing::Test {
+ protected:
+    ~LaunchListenerTest() noexcept override = default;
+
+    /// A socket that listens, in the test's directory.
+    int listen(const char* name) {
+        UniqueFD made(socket(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC | SOCK_NONBLOCK, 0));
+        const sockaddr_un address = addressOf(name);
+        EXPECT_EQ(bind(made.get(), reinterpret_cast<const sockaddr*>(&address), sizeof address), 0);
+        EXPECT_EQ(::listen(made.get(), 5), 0);
+        mListeners.push_back(std::move(made));
+        return mListeners.back().get();
+    }
+    UniqueFD connectTo(const char* name) const {
+        UniqueFD made(socket(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC, 0));
+        const sockaddr_un address = addressOf(name);
+        EXPECT_EQ(connect(made.get(), reinterpret_cast<const sockaddr*>(&address), sizeof address),
+                  0);
+        return made;
+    }
+    /// The manager hands over these under a name.
+    void give(const char* name, std::initializer_list<int> descriptors) {
+        const Ref<MutableArrayOf<Number>> array = MutableArrayOf<Number>::array();
+        for (const int descriptor : descriptors) {
+            const Ref<Number> number = Number::number(descriptor);
+            array->add(number);
+        }
+        const Ref<Values> sockets = Values::dictionary();
+        set(*sockets, name, array);
+        reply("Sockets", sockets);
+    }
+    void reply(const char* key, PFRefCounted* value) {
+        if (!services.reply.dictionary) services.reply.dictionary = Values::dictionary();
+        services.reply.type = Reply::kDictionary;
+        if (key) set(static_cast<Values&>(*services.reply.dictionary), key, value);
+    }
+    static void set(Values& values, const char* key, PFRefCounted* value) {
+        const Ref<String> string = String::string(key);
+        values.set(string, value);
+    }
+    void make() { listener = std::make_unique<LaunchListener>(services); }
+    static void turn() { RunLoop::current().turn(); }
+    /// One turn, for what stays ready.
+    static void turnOnce() { RunLoop::current().runInMode(RunLoop::kDefaultMode, 0, true); }
+    /// What was said while the listener was made.
+    Strings sayings() {
+        log.clear();
+        make();
+        return log.lines();
+    }
+
+    AutoreleasePool pool;
+    Support::TempDir directory;
+    Support::LogCapture log;
+    Support::LoggingOn logging{{&gLogIPC}};
+    FakeServiceManager services;
+    std::unique_ptr<LaunchListener> listener;
+
+ private:
+    sockaddr_un addressOf(const char* name) const {
+        sockaddr_un address = {};
+        address.sun_family = AF_UNIX;
+        std::strncpy(address.sun_path, (directory / name).c_str(), sizeof address.sun_path - 1);
+        return address;
+    }
+    std::vector<UniqueFD> mListeners;
+};
+
+TEST_F(LaunchListenerTest, IsContentWithoutAManager) {
+    services.managed = false;
+    EXPECT_THAT(sayings(),
+                ElementsAre("[IPC] LaunchListener: initializing",
+                            "[IPC] LaunchListener: Checking in with svcd",
+                            "[IPC]     ... not launched by svcd (SVC_KEY_IS_MANAGED == 0)"));
+    EXPECT_EQ(services.checkIns, 0);
+    EXPECT_FALSE(listener->isManaged());
+    log.clear();
+    EXPECT_EQ(listener->getMachServerPort("com.tarnwick.orvane.ipc"), 0);
+    EXPECT_THAT(log.lines(), IsEmpty());
+}
+
+TEST_F(LaunchListenerTest, ChecksInOnce) {
+    give("Render", {listen("a")});
+    EXPECT_EQ(sayings().back(), "[IPC]     ... checked in with svcd!");
+    EXPECT_EQ(services.checkIns, 1);
+    EXPECT_TRUE(listener->isManaged());
+}
+
+struct BadReply {
+    const char* name;
+    Reply::Type type;
+    int error;
+    const char* saying;
+};
+
+class LaunchListenerReply : public LaunchListenerTest,
+                            public testing::WithParamInterface<BadReply> {};
+
+TEST_P(LaunchListenerReply, IsDropped) {
+    services.reply.type = GetParam().type;
+    services.reply.error = GetParam().error;
+    if (GetParam().type == Reply::kDictionary) reply(nullptr, nullptr);
+    const Strings said = sayings();
+    EXPECT_EQ(said.size(), 3u);
+    EXPECT_EQ(said.back(), GetParam().saying);
+    EXPECT_FALSE(listener->isManaged());
+}
+
+INSTANTIATE_TEST_SUITE_P(
+    Replies, LaunchListenerReply,
+    testing::Values(
+        BadReply{"None", Reply::kNone, 0, "[WARNING] Couldn't check in with svcd: no reply"},
+        BadReply{"Empty", Reply::kDictionary, 0, "[IPC]     ... failed: mConfigDict is empty"},
+        BadReply{"NoAccess", Reply::kError, EACCES, "[IPC]     ... not launched by svcd (EACCES)"},
+        BadReply{"Error", Reply::kError, ENOENT,
+                 "[WARNING] Couldn't check in with svcd: errno=2/No such file or directory"},
+        BadReply{"Other", Reply::kOther, 0,
+                 "[IPC]     ... failed: mConfigDict is unexpected type 3"}),
+    [](const auto& each) { return each.param.name; });
+
+TEST_F(LaunchListenerTest, FindsSocketsByTheirName) {
+    const int first = listen("a");
+    const int second = listen("b");
+    give("Render", {first, second});
+    make();
+    const Array* found = listener->getSocketListeners("Render");
+    ASSERT_EQ(found->count(), 2u);
+    EXPECT_EQ(found->getAs<Number>(1)->getInteger(), second);
+    EXPECT_EQ(listener->getServerSocket("Render"), first);
+}
+
+TEST_F(LaunchListenerTest, SaysWhySocketsAreMissing) {
+    services.managed = false;
+    make();
+    log.clear();
+    EXPECT_EQ(listener->getServerSocket("Render"), -1);
+    EXPECT_THAT(log.lines(), ElementsAre("[WARNING] LaunchListener: getSocketListeners failed - "
+                                         "no svcd configDict"));
+    services.managed = true;
+
+    reply("Other", Values::dictionary());
+    make();
+    log.clear();
+    EXPECT_EQ(listener->getSocketListeners("Render"), nullptr);
+    EXPECT_THAT(log.lines(), ElementsAre("[WARNING] LaunchListener: getSocketListeners failed - "
+                                         "No socket dict"));
+
+    give("Render", {});
+    make();
+    for (const char* name : {"Render", "Other"}) {
+        log.clear();
+        EXPECT_EQ(listener->getSocketListeners(name), nullptr);
+        FakeServer server;
+        EXPECT_FALSE(listener->registerServerSocket(&server, name));
+        const std::string line = OVFormat(
+            "[WARNING] LaunchListener: Sockets dict has no entry for key '%s'", std::string(name));
+        EXPECT_THAT(log.lines(), ElementsAre(line, line));
+    }
+}
+
+TEST_F(LaunchListenerTest, KnowsTheServiceThatItWasStartedFor) {
+    const Ref<Values> ports = Values::dictionary();
+    set(*ports, "com.tarnwick.orvane.ipc", Number::number(17));
+    reply("MachServices", ports);
+    make();
+    log.clear();
+    EXPECT_EQ(listener->getMachServerPort("com.tarnwick.orvane.ipc"), 17);
+    EXPECT_THAT(log.lines(), IsEmpty());
+    EXPECT_EQ(listener->getMachServerPort("other"), 0);
+    EXPECT_THAT(log.lines(), ElementsAre("[WARNING] No 'other' key found in MachServices "
+                                         "dictionary in svcd config!"));
+}
+
+TEST_F(LaunchListenerTest, SaysIfItWasStartedForNoService) {
+    give("Render", {listen("a")});
+    make();
+    log.clear();
+    EXPECT_EQ(listener->getMachServerPort("com.tarnwick.orvane.ipc"), 0);
+    EXPECT_THAT(log.lines(), ElementsAre("[WARNING] No MachServices key found in svcd config!"));
+}
+
+TEST_F(LaunchListenerTest, HandsConnectionsOver) {
+    const int first = listen("a");
+    const int second = listen("b");
+    give("Render", {first, second});
+    make();
+    FakeServer server;
+    log.clear();
+    ASSERT_TRUE(listener->registerServerSocket(&server, "Render"));
+    const auto* pointer = static_cast<const void*>(static_cast<ServerSocket*>(&server));
+    EXPECT_THAT(
+        log.lines(),
+        ElementsAre(OVFormat("[IPC] LaunchListener listening on fd %i for ServerSocket %p 'Render'",
+                             first, pointer),
+                    OVFormat("[IPC] LaunchListener listening on fd %i for ServerSocket %p 'Render'",
+                             second, pointer)));
+    turn();
+    EXPECT_THAT(server.connections, IsEmpty());
+    log.clear();
+    const UniqueFD client = connectTo("b");
+    turn();
+    ASSERT_EQ(server.connections.size(), 1u);
+    EXPECT_THAT(
+        log.lines(),
+        ElementsAre(
+            OVFormat("[IPC] LaunchListener::fileDescriptorCallback -- type=1, kqueue=%i",
+                     listener->getEventQueue()),
+            OVFormat("[IPC] LaunchListener got socket event on fd %i: socket=%i, ServerSocket=%p",
+                     second, server.connections[0].get(), pointer),
+            "[IPC] LaunchListener finished socket event"));
+    EXPECT_EQ(write(client.get(), "x", 1), 1);
+    char byte = 0;
+    EXPECT_EQ(read(server.connections[0].get(), &byte, 1), 1);
+    EXPECT_EQ(byte, 'x');
+}
+
+TEST_F(LaunchListenerTest, TakesOneConnectionATurn) {
+    give("Render", {listen("a")});
+    make();
+    FakeServer server;
+    listener->registerServerSocket(&server, "Render");
+    const UniqueFD first = connectTo("a");
+    const UniqueFD second = connectTo("a");
+    turn();
+    EXPECT_EQ(log.count("got socket event"), static_cast<int>(server.connections.size()));
+    while (server.connections.size() < 2) {
+        turn();
+    }
+    EXPECT_EQ(log.count("fileDescriptorCallback"), 2);
+}
+
+TEST_F(LaunchListenerTest, ReportsAServerThatFailsAndGoesOn) {
+    give("Render", {listen("a")});
+    make();
+    FakeServer server;
+    server.throws = true;
+    listener->registerServerSocket(&server, "Render");
+    const UniqueFD first = connectTo("a");
+    turn();
+    EXPECT_TRUE(log.contains("fileDescriptorCallback()"));
+    EXPECT_TRUE(log.contains("full"));
+    server.throws = false;
+    const UniqueFD second = connectTo("a");
+    turn();
+    EXPECT_EQ(server.connections.size(), 2u);
+}
+
+TEST_F(LaunchListenerTest, WantsSomebodyForConnections) {
+    const int socket = listen("a");
+    make();
+    ASSERT_TRUE(listener->registerEvent(static_cast<std::uintptr_t>(socket), EventQueue::kRead,
+                                        EventQueue::kAdd | EventQueue::kEnable, 0, 0, nullptr));
+    const UniqueFD client = connectTo("a");
+    turn();
+    EXPECT_TRUE(log.contains("serverSocket"));
+    // The connection is closed, not left open for good.
+    char byte;
+    EXPECT_EQ(read(client.get(), &byte, 1), 0);
+}
+
+TEST_F(LaunchListenerTest, SaysIfItCannotAccept) {
+    int fds[2];
+    ASSERT_EQ(pipe2(fds, O_CLOEXEC), 0);
+    const UniqueFD readEnd(fds[0]);
+    const UniqueFD writeEnd(fds[1]);
+    make();
+    FakeServer server;
+    listener->registerEvent(static_cast<std::uintptr_t>(readEnd.get()), EventQueue::kRead,
+                            EventQueue::kAdd | EventQueue::kEnable, 0, 0, &server);
+    ASSERT_EQ(write(writeEnd.get(), "x", 1), 1);
+    turnOnce();
+    EXPECT_TRUE(log.contains(OVFormat("[WARNING] LaunchListener: accept(%i) failed, errno=%i",
+                                      readEnd.get(), ENOTSOCK)));
+    EXPECT_THAT(server.connections, IsEmpty());
+}
+
+TEST_F(LaunchListenerTest, SaysIfItCannotWatch) {
+    make();
+    log.clear();
+    EXPECT_FALSE(listener->registerEvent(static_cast<std::uintptr_t>(-1), EventQueue::kRead,
+                                         EventQueue::kAdd | EventQueue::kEnable, 0, 0, nullptr));
+    EXPECT_FALSE(listener->registerSignal(SIGKILL));
+    EXPECT_THAT(log.lines(),
+                ElementsAre("[WARNING] LaunchListener: could not register kevent -1.  Error is "
+                            "9/Bad file descriptor",
+                            "[WARNING] LaunchListener: could not register kevent -6.  Error is "
+                            "22/Invalid argument"));
+}
+
+TEST_F(LaunchListenerTest, RegistersAllSocketsThatItCan) {
+    const int good = listen("a");
+    give("Render", {1 << 20, good});
+    make();
+    FakeServer server;
+    EXPECT_FALSE(listener->registerServerSocket(&server, "Render"));
+    const UniqueFD client = connectTo("a");
+    turn();
+    EXPECT_EQ(server.connections.size(), 1u);
+}
+
+TEST_F(LaunchListenerTest, DoesNotKnowOtherEvents) {
+    int fds[2];
+    ASSERT_EQ(pipe2(fds, O_CLOEXEC), 0);
+    const UniqueFD readEnd(fds[0]);
+    const UniqueFD writeEnd(fds[1]);
+    make();
+    listener->registerEvent(static_cast<std::uintptr_t>(writeEnd.get()), EventQueue::kWrite,
+                            EventQueue::kAdd | EventQueue::kEnable, 0, 0, nullptr);
+    turnOnce();
+    EXPECT_TRUE(log.contains("[WARNING] LaunchListener: Unknown event; filter=-2"));
+}
+
+TEST_F(LaunchListenerTest, EndsTheRunAtASignal) {
+    Support::ManualClock clock;
+    make();
+    ASSERT_TRUE(listener->registerSignal(SIGTERM));
+    log.clear();
+    raise(SIGTERM);
+    raise(SIGTERM);
+    const auto result = RunLoop::current().runInMode(RunLoop::kDefaultMode, 1, false);
+    EXPECT_EQ(result, RunLoop::Result::Stopped);
+    EXPECT_EQ(log.lines().back(), "***** LaunchListener got signal: 15 (Terminated) x2");
+}
+
+TEST_F(LaunchListenerTest, ServesTheDefaultModeAlone) {
+    give("Render", {listen("a")});
+    make();
+    FakeServer server;
+    listener->registerServerSocket(&server, "Render");
+    const UniqueFD client = connectTo("a");
+    RunLoop::current().turn("another");
+    EXPECT_THAT(server.connections, IsEmpty());
+    turn();
+    EXPECT_EQ(server.connections.size(), 1u);
+}
+
+TEST_F(LaunchListenerTest, SaysIfAnEventCannotBeHad) {
+    make();
+    ASSERT_TRUE(listener->registerSignal(SIGUSR2));
+    // Something else that is always readable stands where the queue was.
+    const UniqueFD other(open("/dev/zero", O_RDONLY | O_CLOEXEC));
+    const int queue = listener->getEventQueue();
+    const UniqueFD kept(fcntl(queue, F_DUPFD_CLOEXEC, 0));
+    ASSERT_EQ(dup3(other.get(), queue, O_CLOEXEC), queue);
+    log.clear();
+    turnOnce();
+    EXPECT_TRUE(
+        log.contains("[WARNING] LaunchListener: could not pick up event.  Error is "
+                     "22/Invalid argument"));
+    ASSERT_EQ(dup3(kept.get(), queue, O_CLOEXEC), queue);
+}
+
+}  // namespace
