@@ -1,7 +1,9 @@
 #pragma once
 
 #include <Orvane/OVBase.h>
+#include <Orvane/OVError.h>
 
+#include <memory>
 #include <stdexcept>
 #include <string>
 
@@ -10,8 +12,16 @@
 class OV_EXPORT OVException : public std::runtime_error {
  public:
     explicit OVException(const std::string& text);
+    /// The same with what it was that failed.
+    OVException(const std::string& text, const OVError& error);
     OVException(const OVException&) = default;
     OVException& operator=(const OVException&) = default;
     /// Defined in the library, so that the class has one identity in it and all applications.
     ~OVException() override;
+
+    /// What it was that failed; null where nothing more is known than the text. As long as this.
+    const OVError* error() const { return mError.get(); }
+
+ private:
+    std::shared_ptr<const OVError> mError;
 };

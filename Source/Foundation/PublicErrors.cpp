@@ -3,6 +3,7 @@
 #include "Foundation/Bundle.h"
 #include "Foundation/ErrorTexts.h"
 #include "Foundation/Logger.h"
+#include "Foundation/NetException.h"
 #include "Foundation/PublicErrorMap.h"
 #include "Foundation/TypeName.h"
 
@@ -63,8 +64,11 @@ void doWarnAndRaise(const std::exception* e, const char* where) {
         throw OVException(
             OVFormat("Orvane: An unknown native exception was thrown during %s", where));
     }
-    throw OVException(
-        OVFormat("Orvane %s: %s during %s", getTypeName(typeid(*e)), e->what(), where));
+    const std::string text =
+        OVFormat("Orvane %s: %s during %s", getTypeName(typeid(*e)), e->what(), where);
+    const auto* failure = dynamic_cast<const NetException*>(e);
+    if (!failure) throw OVException(text);
+    throw OVException(text, errorWithNetError(failure->getError(), {}));
 }
 
 void warnAndRaiseCurrentException(const char* where) {

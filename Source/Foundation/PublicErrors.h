@@ -21,7 +21,8 @@ OVError errorWithNetError(const NetError& error, std::string_view url);
 OVError errorWithCode(int code, std::string_view url);
 
 /// Reports an exception that reached the public interface in `where`, and throws `OVException`
-/// with its class and text. `e` is null for an exception that is no `std::exception`.
+/// with its class and text, and its error if it is a `NetException`. `e` is null for an exception
+/// that is no `std::exception`.
 [[noreturn]] void doWarnAndRaise(const std::exception* e, const char* where);
 /// The same for the exception in flight. REQUIRES: called from a catch handler.
 [[noreturn]] void warnAndRaiseCurrentException(const char* where);

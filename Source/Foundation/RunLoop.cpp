@@ -60,6 +60,10 @@ struct RunLoop::Loops {
     }
 };
 
+bool RunLoop::isInsideCallback() {
+    return g_main_depth() > 0;
+}
+
 RunLoop& RunLoop::current() {
     // The main thread's loops are never destroyed: objects that end with the process use them.
     static Loops* const sOfMainThread = new Loops;

@@ -36,6 +36,9 @@ class RunLoop : Uncopyable {
     static RunLoop& current();
     ~RunLoop();
 
+    /// Whether the calling thread is inside a callback of a main context of GLib, of whosever.
+    static bool isInsideCallback();
+
     /// Turns the default mode until `stop`.
     void run();
     /// Turns `mode` until `stop`, until `seconds` have passed on the clock of the process

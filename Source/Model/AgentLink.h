@@ -85,6 +85,12 @@ class AgentLink {
     /// Whether the agent has taken it.
     virtual bool enclosureAction(EnclosureCore* enclosure, int action) = 0;
 
+    /// Starts a sync with the user's other machines soon. Whether the agent does.
+    virtual bool startSync() { return false; }
+    /// Sees to it that the end of the agent, if one runs, is announced in the local centre. Whether
+    /// it will be.
+    virtual bool listenForAgentDeath() { return false; }
+
     /// The link of the process; an `UnreachableAgent` until one is set.
     static AgentLink& current();
     /// The link must outlive its use. Null takes it away.

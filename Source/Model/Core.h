@@ -40,6 +40,8 @@ class Core : public SQLite::ListedRow {
     /// The public object of a row, made on first use; null for null. Throws `AssertionFailure` if
     /// it cannot be made. The result is not the caller's own.
     static OVObject* getOVObject(Core* core);
+    /// The one that there is, or null.
+    OVObject* getExistingOVObject() const { return mOVObject; }
     /// For the public object: stands for the row from now on. Throws `AssertionFailure` if another
     /// one does.
     void setOVObject(OVObject* object);

@@ -49,6 +49,7 @@ void FeedCore::letGo() {
 }
 
 OVObject* FeedCore::createOVObject() {
+    OV_ASSERT_MESSAGE_AS(false, "false", "Can't call getOVObject on a FeedCore!");
     return nullptr;
 }
 

@@ -129,7 +129,7 @@ class FeedCore : public FeedColumns {
     /// Deletes it with all its entries and files. What of these cannot be deleted is reported.
     void deleteRow() override;
 
-    /// None: clients see a feed by its subscription.
+    /// Throws `AssertionFailure`: clients see a feed by its subscription.
     OVObject* createOVObject() override;
 
  private:

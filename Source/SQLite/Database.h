@@ -26,6 +26,7 @@ class URL;
 namespace SQLite {
 
 class Exception;
+class Query;
 class Statement;
 class Table;
 
@@ -114,6 +115,10 @@ class Database : Foundation::Uncopyable {
     void integrityCheck();
     /// Gives free pages back to the file system if there are many.
     void vacuumIncrementally();
+    /// In a process that only reads, outside of all callbacks of the run loop: lets go of what was
+    /// read of rows if another process has changed the file since the last call. Who turns the loop
+    /// is told of that, but others are not. Throws `Exception`.
+    void refreshIfUnturned();
     /// Tells the clients that another file has taken this one's place.
     void postReplacedNotification();
 
@@ -184,6 +189,8 @@ class Database : Foundation::Uncopyable {
     Foundation::Timer<Database> mFatalTimer;
     Foundation::Ref<Foundation::Dictionary> mFatalError;
     std::unique_ptr<ChangeObserver> mChangeObserver;
+    std::unique_ptr<Query> mVersionQuery;
+    int mDataVersion = 0;  ///< of the file, when it was last looked at; 0 before
 
     RowJournal mJournal;
     DeletedRows mDeletedRows;

@@ -3,7 +3,9 @@
 #include "Foundation/Guard.h"
 #include "Foundation/Logger.h"
 #include "Foundation/NotificationCenter.h"
+#include "Foundation/RunLoop.h"
 #include "Foundation/URL.h"
+#include "SQLite/Cursor.h"
 #include "SQLite/Database.h"
 #include "SQLite/Table.h"
 
@@ -105,6 +107,19 @@ void Database::_postFatalErrorNotification() {
     const Ref<Dictionary> report = std::move(mFatalError);
     mFatalError = nullptr;
     NotificationCenter::getLocal()->post(kDatabaseFatalErrorNotification, this, report.get());
+}
+
+void Database::refreshIfUnturned() {
+    if (!mOpen || mWriteable || Foundation::RunLoop::isInsideCallback()) return;
+    if (!mVersionQuery) {
+        mVersionQuery = std::make_unique<Query>(this, SQLText("PRAGMA data_version"));
+    }
+    const int version = Cursor(*mVersionQuery).intColumn(0);
+    if (version == std::exchange(mDataVersion, version)) return;
+    gLogPersist.log("===== The file has changed, and nobody turns the run loop");
+    for (Table* table : mTables) {
+        table->_rolledBack();
+    }
 }
 
 void Database::postReplacedNotification() {

@@ -7,6 +7,8 @@
 #include "Model/PublicObjects.h"
 #include "Support/AssertionOf.h"
 
+#include <Orvane/OVObject.h>
+
 using namespace Foundation;
 using namespace Orvane;
 using namespace SQLite;
@@ -14,12 +16,12 @@ using Support::assertionOf;
 using Support::LogCapture;
 using Support::LoggingOn;
 
-class OVObject {
+namespace {
+
+class FakeObject : public OVObject {
  public:
     int kind = 0;
 };
-
-namespace {
 
 /// Gives the same object for every row, of a kind for each class.
 class FakeObjects : public PublicObjects {
@@ -35,7 +37,7 @@ class FakeObjects : public PublicObjects {
     OVObject* make(EnclosureCore*) override { return madeOf(6); }
     const char* getClassName(const OVObject*) noexcept override { return "OVThing"; }
 
-    OVObject object;
+    FakeObject object;
     int made = 0;
     bool fails = false;
 
@@ -59,7 +61,7 @@ class CoreTest : public ModelTest {
         const Ref<T> core = row<T>();
         OVObject* object = Core::getOVObject(core.get());
         core->clearOVObject(object);
-        return object->kind;
+        return static_cast<FakeObject*>(object)->kind;
     }
 
     FakeObjects objects;
@@ -130,14 +132,15 @@ TEST_F(CoreTest, AssertsThatThePublicObjectCouldBeMade) {
     EXPECT_EQ(assertionOf([&] { Core::getOVObject(author.get()); }), "mOVObject");
     const Ref<FeedCore> feed = row<FeedCore>();
     objects.fails = false;
-    EXPECT_EQ(assertionOf([&] { Core::getOVObject(feed.get()); }), "mOVObject");
+    EXPECT_EQ(assertionOf([&] { Core::getOVObject(feed.get()); }),
+              "Can't call getOVObject on a FeedCore!");
     PublicObjects::setCurrent(nullptr);
     EXPECT_EQ(assertionOf([&] { Core::getOVObject(author.get()); }), "mOVObject");
 }
 
 TEST_F(CoreTest, DoesNotReplaceAPublicObject) {
     const Ref<AuthorCore> author = row<AuthorCore>();
-    OVObject other;
+    FakeObject other;
     author->setOVObject(&objects.object);
     author->setOVObject(&objects.object);
     EXPECT_EQ(
@@ -150,7 +153,7 @@ TEST_F(CoreTest, DoesNotReplaceAPublicObject) {
 
 TEST_F(CoreTest, IsLeftOnlyByItsPublicObject) {
     const Ref<AuthorCore> author = row<AuthorCore>();
-    OVObject other;
+    FakeObject other;
     author->setOVObject(&objects.object);
     EXPECT_EQ(assertionOf([&] { author->clearOVObject(&other); }), "ovObject==mOVObject");
     author->clearOVObject(&objects.object);

@@ -1,0 +1,63 @@
+#include "Bridges/OVEntryInternal.h"
+
+#include "Bridges/OVClientInternal.h"
+#include "Bridges/OVFeedInternal.h"
+#include "Bridges/PublicObjectFactory.h"
+#include "Foundation/AssertionFailure.h"
+#include "Foundation/Logger.h"
+#include "Model/ClientCore.h"
+#include "Model/FeedCore.h"
+#include "Model/SubscriptionCore.h"
+
+using namespace Foundation;
+using namespace Orvane;
+
+std::shared_ptr<OVEntry> OVEntryInternal::make(EntryCore* core) {
+    auto internal = std::make_unique<OVEntryInternal>();
+    OVEntryInternal& state = *internal;
+    std::shared_ptr<OVEntry> made(new OVEntry(std::move(internal)));
+    state.setCore(core, made.get());
+    return made;
+}
+
+/// Whether a feed is not the one any more that the entry was found by, because its subscription has
+/// ended.
+bool OVEntryInternal::hasMoved(const OVFeed& from) const {
+    return peek()->getTable() && !from._internal()._subscriptionCore();
+}
+
+void OVEntryInternal::_setFeed(const std::shared_ptr<OVFeed>& newFeed) {
+    OV_ASSERT_AS(newFeed != nullptr, "newFeed");
+    OV_ASSERT_MESSAGE_AS(!feed || feed == newFeed || hasMoved(*feed), "!feed || feed==newFeed",
+                         "Trying to _setFeed of %@ to %@ when it's already %@", getOwner(),
+                         newFeed.get(), feed.get());
+    feed = newFeed;
+}
+
+std::shared_ptr<OVFeed> OVEntryInternal::findFeed() {
+    if (feed) return feed;
+    FeedCore* feedCore = core().getFeed();
+    if (feedCore && client) {
+        gLogAPI.log("Have to look up feed of %@", getOwner());
+        const Ref<SubscriptionCore> subscription =
+            client->_internal().core().getSubscription(feedCore);
+        feed = publicObject<OVFeed>(subscription.get());
+    }
+    if (!feed) {
+        gWarn.log("Couldn't find OVFeed of %@ (FeedCore=%@, OVClient=%@)", getOwner(), feedCore,
+                  client.get());
+    }
+    return feed;
+}
+
+Ref<Core> OVEntryInternal::findAgain() {
+    const EntryCore* old = peek();
+    if (!old->mIdentifier.isLoaded() || !old->mIdentifier.getValue()) return nullptr;
+    const Ref<EntryCore> again = EntryCore::getEntryWithIdentifier(old->mIdentifier.getValue());
+    return Ref<Core>(again);
+}
+
+void OVEntryInternal::foundAgain() {
+    titleForDisplay.clear();
+    if (feed && !feed->_internal()._subscriptionCore()) feed = nullptr;
+}

@@ -1,0 +1,44 @@
+#pragma once
+
+#include "Bridges/OVInternal.h"
+#include "Model/EntryCore.h"
+
+#include <Orvane/OVEntry.h>
+
+#include <memory>
+#include <string>
+
+class OVClient;
+class OVFeed;
+
+/// The state of an `OVEntry`.
+class OVEntryInternal : public OVInternal {
+ public:
+    /// The public object of a row that has none.
+    static std::shared_ptr<OVEntry> make(Orvane::EntryCore* core);
+
+    /// The row, for use: see `OVInternal::useCore`.
+    Orvane::EntryCore& core() const { return static_cast<Orvane::EntryCore&>(useCore()); }
+    /// The same to look at; null only while the object is made.
+    Orvane::EntryCore* peek() const { return static_cast<Orvane::EntryCore*>(getCore()); }
+
+    /// The feed by which it was found. Throws `AssertionFailure` for null, and if that is another
+    /// one that still has the entry.
+    void _setFeed(const std::shared_ptr<OVFeed>& newFeed);
+    void _setClient(const std::shared_ptr<OVClient>& newClient) { client = newClient; }
+    /// See `OVEntry::feed`.
+    std::shared_ptr<OVFeed> findFeed();
+
+    std::shared_ptr<OVFeed> feed;      ///< null until it is known
+    std::shared_ptr<OVClient> client;  ///< through which it was found; may be null
+    std::string titleForDisplay;       ///< empty until it is made
+    double titleDate = 0;              ///< of the data that it was made of
+
+ protected:
+    Rank getRank() const override { return Rank::Entry; }
+    Foundation::Ref<Orvane::Core> findAgain() override;
+    void foundAgain() override;
+
+ private:
+    bool hasMoved(const OVFeed& from) const;
+};
