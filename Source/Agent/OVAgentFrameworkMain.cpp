@@ -1,5 +1,6 @@
 #include "Agent/OVAgentFrameworkMain.h"
 
+#include "Agent/AgentLock.h"
 #include "Agent/AgentName.h"
 #include "Agent/AgentPorts.h"
 #include "Agent/AgentTask.h"
@@ -20,27 +21,29 @@ namespace {
 
 constexpr const char* kIdentifier = "com.tarnwick.Orvane.Agent";
 
-/// Whether this process is to be the agent.
-bool isAgent() {
+/// Whether this process is to be the agent. Others would write to the same database.
+bool isAgent(AgentLock& lock) {
     const AgentName::Claim claim = AgentName::claim();
     if (claim == AgentName::Claim::kTaken) {
         gLog.log("Another process owns %s: leaving it the work", BusCenter::kAgentName);
         return false;
     }
-    if (claim == AgentName::Claim::kNoBus) {
-        gWarn.log("No message bus: the agent goes on, but nobody can call it");
-    }
-    return true;
+    const bool hasName = claim == AgentName::Claim::kOurs;
+    if (!hasName) gWarn.log("No message bus: the agent goes on, but nobody can call it");
+    // Who had the name before may still be about to close the database.
+    if (lock.take(hasName ? AgentLock::kWaitSeconds : 0)) return true;
+    gLog.log("Another process works on the storage: leaving it the work");
+    return false;
 }
 
 /// Whether there is anything to be run.
-bool setUp(AgentTask& task) {
+bool setUp(AgentTask& task, AgentLock& lock) {
     const AutoreleasePool pool;
     gLog.log("----- Orvane Agent STARTING -----");
     LaunchListener::instance()->registerSignal(SIGTERM);
     std::signal(SIGPIPE, SIG_IGN);
     // First of all that touches the database: there are never two who write to it.
-    if (!isAgent()) return false;
+    if (!isAgent(lock)) return false;
     task.start(true);
     gLog.log("Orvane Agent finished setup; starting runloop");
     return true;
@@ -48,8 +51,9 @@ bool setUp(AgentTask& task) {
 
 void run() {
     const AgentPorts ports;
+    AgentLock lock;
     AgentTask task;
-    if (!setUp(task)) return;
+    if (!setUp(task, lock)) return;
     RunLoop::current().run();
     gLog.log("Orvane Agent exited runloop");
     AgentName::giveUp();

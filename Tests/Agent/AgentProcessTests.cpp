@@ -8,7 +8,9 @@
 #include "Support/FileAccess.h"
 #include "Support/PrivateBus.h"
 
+#include <fcntl.h>
 #include <gmock/gmock.h>
+#include <sys/file.h>
 #include <sys/socket.h>
 #include <sys/un.h>
 #include <sys/wait.h>
@@ -156,6 +158,32 @@ TEST_F(AgentProcess, GoesOnWithoutABus) {
     agent.emplace(std::vector<std::string>{"/bin/sh", "-c", command});
     ASSERT_TRUE(hasLogged(kRunning)) << log();
     EXPECT_THAT(log(), HasSubstr("No message bus: the agent goes on, but nobody can call it"));
+    EXPECT_EQ(end(SIGTERM), 0);
+}
+
+TEST_F(AgentOnBus, WaitsForTheAgentBeforeItToClose) {
+    fs::create_directories(home.path() / "data/Orvane");
+    const UniqueFD before(open((home / "data/Orvane/.agent").c_str(), O_RDWR | O_CREAT, 0600));
+    ASSERT_EQ(flock(before.get(), LOCK_EX), 0);
+    const std::string command = "exec " ORVANE_AGENT " 2> '" + (home / "log") + "'";
+    agent.emplace(std::vector<std::string>{"sh", "-c", command});
+    ASSERT_TRUE(turnUntil([] { return !Bus::user().getNameOwner(BusCenter::kAgentName).empty(); }));
+    EXPECT_FALSE(fs::exists(database()));
+    ASSERT_EQ(flock(before.get(), LOCK_UN), 0);
+    ASSERT_TRUE(hasLogged(kRunning)) << log();
+    EXPECT_EQ(end(SIGTERM), 0);
+}
+
+TEST_F(AgentProcess, LeavesTheWorkToAnAgentThatNoBusKnows) {
+    const EnvVar noBus("DBUS_SESSION_BUS_ADDRESS", "unix:path=/nonexistent/bus");
+    const EnvVar noPrograms("PATH", home.makeDirectory("empty").c_str());
+    const std::string command = "exec " ORVANE_AGENT " 2> '" + (home / "log") + "'";
+    agent.emplace(std::vector<std::string>{"/bin/sh", "-c", command});
+    ASSERT_TRUE(hasLogged(kRunning)) << log();
+    const ChildResult second = run();
+    EXPECT_EQ(second.status, 0);
+    EXPECT_THAT(second.err, HasSubstr("Another process works on the storage"));
+    EXPECT_THAT(second.err, Not(HasSubstr("Starting AgentTask")));
     EXPECT_EQ(end(SIGTERM), 0);
 }
 

@@ -168,6 +168,7 @@ TEST_F(AgentQuittingTest, PutsTheEndOffAnew) {
 
 TEST(AgentQuitting, WaitsForFilesThatAreBeingDeleted) {
     const Support::TempDir directory;
+    const Support::LogCapture log;
     {
         const AutoreleasePool pool;
         Support::ManualClock clock;
