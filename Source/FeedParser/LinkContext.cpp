@@ -1,6 +1,10 @@
 #include "FeedParser/LinkContext.h"
 
-#include "FeedParser/Text/XMLCharacters.h"
+#include <algorithm>
+#include <charconv>
+#include <limits>
+#include <string_view>
+#include <system_error>
 
 namespace Orvane::FeedParser {
 
@@ -10,10 +14,14 @@ using Foundation::URL;
 
 namespace {
 
-/// The number at the start of the text, which has no sign; 0 if there is none.
-long long leadingDigits(const String& text) {
-    const bool isDigit = !text.utf8().empty() && XMLCharacters::isDigit(text.utf8().front());
-    return isDigit ? text.toLongLong() : 0;
+/// The number that the text's first digits make, the largest if 64 bits do not hold it; 0 if the
+/// text begins with none.
+long long leadingDigits(std::string_view text) {
+    const std::size_t count = std::min(text.find_first_not_of("0123456789"), text.size());
+    long long number = 0;
+    const auto result = std::from_chars(text.data(), text.data() + count, number);
+    const bool isTooLarge = result.ec == std::errc::result_out_of_range;
+    return isTooLarge ? std::numeric_limits<long long>::max() : number;
 }
 
 }  // namespace
@@ -46,7 +54,7 @@ void LinkContext::gotAttribute(const char* prefix, const char* name, const char*
             break;
         case SizeTag:
         case LengthTag:
-            enclosure->mLength.setValue(leadingDigits(*wanted));
+            enclosure->mLength.setValue(leadingDigits(wanted->view()));
             break;
         default:
             break;

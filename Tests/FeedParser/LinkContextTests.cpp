@@ -31,12 +31,19 @@ TEST_F(LinkContextTest, TakesValuesWithoutOuterWhiteSpace) {
 
 TEST_F(LinkContextTest, TakesTheDigitsThatALengthBeginsWith) {
     const std::pair<const char*, long long> lengths[] = {
-        {"12", 12},   {" 12 bytes", 12},
-        {"007", 7},   {"1.5", 1},
-        {"-5", 0},    {"+5", 0},
-        {"- 5", 0},   {"x5", 0},
-        {"0x10", 0},  {" ", 0},
-        {"1,024", 1}, {"99999999999999999999", std::numeric_limits<long long>::max()}};
+        {"12", 12},
+        {" 12 bytes", 12},
+        {"007", 7},
+        {"1.5", 1},
+        {"-5", 0},
+        {"+5", 0},
+        {"- 5", 0},
+        {"x5", 0},
+        {"0x10", 0},
+        {" ", 0},
+        {"1,024", 1},
+        {"99999999999999999999", std::numeric_limits<long long>::max()},
+        {"12 bytes, or so says whoever made this feed", 12}};
     for (const auto& [text, length] : lengths) {
         context->gotAttribute(nullptr, "length", "77");
         context->gotAttribute(nullptr, "size", text);
