@@ -4,6 +4,7 @@
 #include "Agent/AgentName.h"
 #include "Agent/AgentPorts.h"
 #include "Agent/AgentTask.h"
+#include "Agent/IPCServer.h"
 #include "Agent/LaunchListener.h"
 #include "Foundation/ApplicationIdentity.h"
 #include "Foundation/AutoreleasePool.h"
@@ -45,6 +46,8 @@ bool setUp(AgentTask& task, AgentLock& lock) {
     // First of all that touches the database: there are never two who write to it.
     if (!isAgent(lock)) return false;
     task.start(true);
+    gLog.log("Orvane Agent starting API MIG server");
+    IPCServer::startServer();
     gLog.log("Orvane Agent finished setup; starting runloop");
     return true;
 }

@@ -7,16 +7,22 @@ namespace Orvane {
 namespace {
 
 AgentLink* sCurrent = nullptr;
+AgentLink::Maker sMaker = nullptr;
 
 }  // namespace
 
 AgentLink& AgentLink::current() {
     static UnreachableAgent sNone;
-    return sCurrent ? *sCurrent : sNone;
+    if (sCurrent) return *sCurrent;
+    return sMaker ? *sMaker() : sNone;
 }
 
 void AgentLink::setCurrent(AgentLink* link) {
     sCurrent = link;
+}
+
+void AgentLink::setMaker(Maker maker) {
+    sMaker = maker;
 }
 
 }  // namespace Orvane

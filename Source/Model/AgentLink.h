@@ -95,6 +95,9 @@ class AgentLink {
     static AgentLink& current();
     /// The link must outlive its use. Null takes it away.
     static void setCurrent(AgentLink* link);
+    /// What makes the link, at the first use without one that is set. Null takes it away.
+    using Maker = AgentLink* (*)();
+    static void setMaker(Maker maker);
 };
 
 }  // namespace Orvane

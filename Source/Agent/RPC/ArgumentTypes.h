@@ -21,13 +21,14 @@ enum class Fault {
 };
 
 // The types of arguments and results. Each has the name that it is called by, its form in a message
-// (D-Bus Specification, "Type System"), and the C++ type of its values. Values that are spans
-// belong to the message that they came in.
+// (D-Bus Specification, "Type System"), the C++ type of its values, and that of a parameter for
+// one. Values that are spans belong to the message that they came in.
 
 /// A type of fixed size, every value of which is good.
 template <class T>
 struct PlainType {
     using Value = T;
+    using In = T;
     static bool read(Foundation::BusMessage& message, T& value) { return message.read(value); }
     static void append(Foundation::BusMessage& message, T value) { message.append(value); }
     static Fault check(T) { return Fault::None; }
@@ -60,6 +61,7 @@ struct UInt64 : PlainType<std::uint64_t> {
 
 struct RowIDs {
     using Value = std::span<const std::int64_t>;
+    using In = Value;
     static constexpr const char* kName = "RowIDs";
     static constexpr const char* kForm = "ax";
     static bool read(Foundation::BusMessage& message, Value& value) { return message.read(value); }
@@ -74,6 +76,7 @@ struct RowIDs {
 template <std::size_t kBytes>
 struct CString {
     using Value = std::string;
+    using In = const std::string&;
     static constexpr const char* kForm = "s";
     static bool read(Foundation::BusMessage& message, Value& value) { return message.read(value); }
     static void append(Foundation::BusMessage& message, const Value& value) {
@@ -93,6 +96,7 @@ struct CString255 : CString<256> {
 /// Bytes. None stand for null.
 struct Bytes {
     using Value = std::span<const std::uint8_t>;
+    using In = Value;
     static constexpr const char* kName = "bytes";
     static constexpr const char* kForm = "ay";
     static bool read(Foundation::BusMessage& message, Value& value) { return message.read(value); }

@@ -76,7 +76,7 @@ class RoutineOf<Arguments<A...>, Results<R...>> : public Routine {
     using ArgumentList = Arguments<A...>;
     using ResultList = Results<R...>;
     /// What does it in the agent.
-    using Implementation = void (*)(const typename A::Value&..., typename R::Value&...);
+    using Implementation = void (*)(typename A::In..., typename R::Value&...);
 
     constexpr RoutineOf(int routineNumber, const char* routineName,
                         const typename ArgumentList::Names& argumentNames,
@@ -84,7 +84,7 @@ class RoutineOf<Arguments<A...>, Results<R...>> : public Routine {
         : Routine{routineNumber, routineName, ArgumentList::parameters(argumentNames),
                   ResultList::parameters(resultNames)} {}
 
-    std::int32_t operator()(std::uint32_t port, const typename A::Value&... values,
+    std::int32_t operator()(std::uint32_t port, typename A::In... values,
                             typename R::Value&... given) const {
         AgentService& service = AgentService::instance();
         Foundation::BusMessage request = service.newRequest(port, name);
