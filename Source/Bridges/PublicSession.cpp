@@ -1,5 +1,6 @@
 #include "Bridges/PublicSession.h"
 
+#include "Agent/Client/IPCClient.h"
 #include "Bridges/PublicObjectFactory.h"
 #include "FeedParser/ParserPort.h"
 #include "Model/ClientSession.h"
@@ -17,6 +18,7 @@ void PublicSession::connect() {
 
 void PublicSession::open() {
     connect();
+    IPCClient::connect();
     ClientSession::open();
 }
 
