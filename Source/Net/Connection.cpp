@@ -3,6 +3,7 @@
 #include "Foundation/AssertionFailure.h"
 #include "Foundation/Clock.h"
 #include "Foundation/Logger.h"
+#include "Net/BodyReader.h"
 #include "Net/ConnectionLimits.h"
 #include "Net/ConnectionService.h"
 
@@ -13,11 +14,13 @@ namespace Orvane {
 using Foundation::NetError;
 using Foundation::Ref;
 using Foundation::Returner;
+using Foundation::String;
 
 Connection::Connection(const ConnectionRequest* request, ConnectionClient* client)
     : mService(ConnectionService::shared()),
       mClient(client),
       mRequest(request->copy()),
+      mFirstURL(request->getURL()),
       mBeginTimer(this, &Connection::begin),
       mStallTimer(this, &Connection::timedOut),
       mTotalTimer(this, &Connection::tookTooLong) {}
@@ -50,6 +53,7 @@ void Connection::beginIfReady() {
 void Connection::begin() {
     const Ref<Connection> self(this);
     if (mPhase == Phase::Declined) return deliverHeld();
+    if (mPhase == Phase::Skipping) return sendNext();
     const Ref<ConnectionRequest> request = mClient->willSendRequest(mRequest, nullptr);
     if (!mClient) return;
     if (!request) return fail(NetError(NetError::kPFURL, OVURLErrorCancelled));
@@ -64,14 +68,27 @@ void Connection::send() {
     if (!url.isScheme("http") && !url.isScheme("https")) {
         return fail(NetError(NetError::kPFURL, OVURLErrorUnsupportedURL));
     }
-    startExchange();
+    if (answerFromCache() || answerForHost()) return;
+    takeTicket();
+}
+
+/// Waits for the host to have room; no time counts until then.
+void Connection::takeTicket() {
+    mStallTimer.stop();
+    mTicket.reset();
+    mTicket = mService.hostSlots().take(Origin::of(*mRequest->getURL()).host,
+                                        [this] { startExchange(); });
+    if (mTicket->mayRun()) startExchange();
 }
 
 void Connection::startExchange() {
     ExchangeRequest request;
     request.message = Ref<HTTPMessage>(&mRequest->message());
     request.acceptsCodings = mRequest->isDocument();
-    request.handlesCookies = mRequest->handlesCookies();
+    request.handlesCookies = mRequest->handlesCookies() &&
+                             mRequest->getCookieAcceptPolicy() != CookieAcceptPolicy::Never;
+    if (request.handlesCookies) request.cookies = mService.cookies().findFor(*mRequest->getURL());
+    mSentCookies = request.cookies;
     mSentLogin = mayUseLogin();
     if (mSentLogin) {
         request.credential = mLogin->credential;
@@ -100,9 +117,11 @@ void Connection::moved() {
 void Connection::gotHead(ExchangeHead head) {
     const Ref<Connection> self(this);
     moved();
+    takeCookies(head);
     const Ref<HTTPMessage> message = HTTPMessage::response(head.status, std::move(head.headers));
     const Ref<ConnectionResponse> response = ConnectionResponse::response(
         &mRequest->message(), message, Foundation::Clock::current().now());
+    mService.retryTimes().note(*mRequest->getURL(), *message);
     if (followRedirect(response) || askForLogin(response)) return;
     if (mClient) deliver(response);
 }
@@ -153,18 +172,36 @@ void Connection::ended(const ExchangeEnd& end) {
     finishBody();
 }
 
+void Connection::takeCookies(const ExchangeHead& head) {
+    const bool isHandled =
+        mRequest->handlesCookies() &&
+        CookieStore::accepts(mRequest->getCookieAcceptPolicy(),
+                             Origin::of(*mRequest->getURL()).host, Origin::of(*mFirstURL).host);
+    if (isHandled) mService.cookies().update(mSentCookies, head.cookies);
+}
+
 void Connection::deliver(ConnectionResponse* response) {
     mPhase = Phase::Body;
+    keepLogin(*response);
+    const Ref<String> url = response->getURL()->getAbsoluteString();
+    mReader = std::make_unique<BodyReader>(url->utf8(), *response->getHTTPMessage(),
+                                           mRequest->isDocument());
+    if (const NetError error = mReader->open(); error.code != 0) return fail(error);
     mClient->didReceiveResponse(response);
 }
 
 void Connection::deliverBlock(std::string_view block) {
-    const Ref<Foundation::Data> data =
-        Foundation::Data::data(block.data(), block.size(), /*copy=*/false);
-    mClient->didReceiveData(data, static_cast<long>(block.size()));
+    const NetError error = mReader->take(block, [this](std::string_view decoded) {
+        const Ref<Foundation::Data> data =
+            Foundation::Data::data(decoded.data(), decoded.size(), /*copy=*/false);
+        mClient->didReceiveData(data, static_cast<long>(decoded.size()));
+        return mClient != nullptr;
+    });
+    if (error.code != 0) fail(error);
 }
 
 void Connection::finishBody() {
+    if (const NetError error = mReader->finish(); error.code != 0) return fail(error);
     close()->didFinishLoading();
 }
 
@@ -194,6 +231,7 @@ ConnectionClient* Connection::close() {
     mStallTimer.stop();
     mTotalTimer.stop();
     mExchange.reset();
+    mTicket.reset();
     mPhase = Phase::New;
     mIsStarted = false;
     return std::exchange(mClient, nullptr);

@@ -5,6 +5,8 @@
 #include "Net/ConnectionClient.h"
 #include "Net/ConnectionRequest.h"
 #include "Net/ConnectionResponse.h"
+#include "Net/CookieStore.h"
+#include "Net/HostSlots.h"
 #include "Net/Transport.h"
 
 #include <memory>
@@ -13,6 +15,7 @@
 
 namespace Orvane {
 
+class BodyReader;
 class ConnectionService;
 
 /// Fetches what a URL leads to: asks server after server as redirects lead on, answers demands for
@@ -70,7 +73,12 @@ class Connection : public Foundation::RefCounted, private ExchangeClient {
     void beginIfReady();
     void begin();
     void send();
+    void takeTicket();
     void startExchange();
+    void takeCookies(const ExchangeHead& head);
+    bool answerFromCache();
+    bool answerForHost();
+    void deliverWhole(ConnectionResponse* response, Foundation::Data* data);
     bool mayUseLogin() const;
 
     bool followRedirect(ConnectionResponse* response);
@@ -87,6 +95,7 @@ class Connection : public Foundation::RefCounted, private ExchangeClient {
     void deliverHeld();
 
     void deliver(ConnectionResponse* response);
+    void keepLogin(const ConnectionResponse& response);
     void deliverBlock(std::string_view block);
     void finishBody();
 
@@ -103,7 +112,11 @@ class Connection : public Foundation::RefCounted, private ExchangeClient {
     Foundation::Ref<ConnectionRequest> mNext;       ///< the one after it
     Foundation::Ref<ConnectionResponse> mResponse;  ///< of the challenge, until it is answered
     Foundation::Ref<AuthenticationChallenge> mChallenge;
+    const Foundation::Ref<Foundation::URL> mFirstURL;  ///< the one that the client asked for
+    std::unique_ptr<HostSlots::Ticket> mTicket;        ///< while it asks a host
     std::unique_ptr<Exchange> mExchange;
+    CookieStore::Lines mSentCookies;
+    std::unique_ptr<BodyReader> mReader;  ///< of the response that is delivered
     Phase mPhase = Phase::New;
     bool mIsScheduled = false;
     bool mIsStarted = false;

@@ -18,6 +18,11 @@ NetError ConnectionError::toNetError() const {
     return {NetError::kCustom, -1};
 }
 
+NetError ConnectionError::toLoadingError() const {
+    if (mDomain->view() == kNetworkDomain) return {NetError::kPFURL, mCode};
+    return toNetError();
+}
+
 Foundation::StringReturner ConnectionError::toString() const {
     return Foundation::String::stringOfUTF8(mText);
 }

@@ -26,6 +26,8 @@ class ConnectionError : public Foundation::PFRefCounted {
     /// The same as a plain error: an `errno` in domain 1 and a code of the resolver in domain 12.
     /// Any other gives a domain and a code of all ones, which say no more than that there was one.
     Foundation::NetError toNetError() const;
+    /// The same, but one of the network's own domain is its code in domain 15.
+    Foundation::NetError toLoadingError() const;
     /// The text.
     Foundation::StringReturner toString() const override;
 

@@ -57,7 +57,8 @@ void Connection::useCredential(Credential* credential) {
     restartTimers();
     if (credential && challenge->isSafe()) {
         repeatWith(credential, *challenge->getProtectionSpace(), /*isFromClient=*/true);
-        if (mHeldEnd) sendNext();
+        // From a turn of the loop, as everything that the client may hear of.
+        if (mHeldEnd) mBeginTimer.start(0.0, false);
         return;
     }
     mPhase = Phase::Declined;

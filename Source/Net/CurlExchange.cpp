@@ -1,10 +1,12 @@
 #include "Net/CurlExchange.h"
 
 #include "Foundation/AssertionFailure.h"
-#include "Foundation/Logger.h"
+#include "Foundation/Guard.h"
+#include "Net/BodyDecoder.h"
 #include "Net/ConnectionLimits.h"
 #include "Net/CurlErrors.h"
 #include "Net/CurlTransport.h"
+#include "Net/WWWAuthenticate.h"
 
 #include <curl/curl.h>
 
@@ -76,6 +78,7 @@ CurlExchange::CurlExchange(CurlTransport& transport, const ExchangeRequest& requ
                            ExchangeClient& client, Easy easy)
     : mTransport(transport),
       mClient(client),
+      mIsRepeated(easy != nullptr),
       mEasy(easy ? std::move(easy) : Easy(curl_easy_init())),
       mMessage(request.message),
       mErrorText(CURL_ERROR_SIZE, '\0') {
@@ -162,7 +165,9 @@ void CurlExchange::setUpHeaders(const ExchangeRequest& request) {
     }
     // Not to wait for servers that never say "100 Continue".
     if (mMessage->getBody()) add("Expect:");
-    static_cast<void>(request);
+    if (request.acceptsCodings && !mMessage->hasHeader("Accept-Encoding")) {
+        add(std::string("Accept-Encoding: ") + BodyDecoder::kAcceptedCodings);
+    }
     set(mEasy.get(), CURLOPT_HTTPHEADER, mHeaderList.get());
 }
 
@@ -192,8 +197,12 @@ void CurlExchange::setUpCookies(const ExchangeRequest& request) {
 std::size_t CurlExchange::headerCallback(char* data, std::size_t size, std::size_t count,
                                          void* self) {
     auto& exchange = *static_cast<CurlExchange*>(self);
+    bool goesOn = false;
+    Foundation::callGuarded(__PRETTY_FUNCTION__, [&] {
+        goesOn = exchange.takeHeader(std::string_view(data, size * count));
+    });
     // Any other number than the given one makes libcurl give up.
-    return exchange.takeHeader(std::string_view(data, size * count)) ? size * count : 0;
+    return goesOn ? size * count : 0;
 }
 
 bool CurlExchange::takeHeader(std::string_view line) {
@@ -208,7 +217,7 @@ bool CurlExchange::takeHeader(std::string_view line) {
     if (mHead.status == 0 || mHeadIsWhole) {
         takeStatusLine(text);
     } else if (text.empty()) {
-        takeHeadEnd();
+        return takeHeadEnd();
     } else if (line.front() == ' ' || line.front() == '\t') {
         // A line that goes on: RFC 9112, 5.2.
         if (!mHead.headers.empty()) mHead.headers.back().value.append(" ").append(text);
@@ -229,18 +238,35 @@ void CurlExchange::takeStatusLine(std::string_view line) {
     std::from_chars(rest.data(), rest.data() + rest.size(), mHead.status);
 }
 
-void CurlExchange::takeHeadEnd() {
+/// False to end the transfer here.
+bool CurlExchange::takeHeadEnd() {
     mHeadIsWhole = true;
+    mIsCutShort = mIsRepeated && isRefused();
     // Of a login that was refused libcurl tells by what it does next.
-    mHeadIsFinal = mHead.status >= 200 && !(mHead.status == 401 && mHasLogin);
+    mHeadIsFinal = mIsCutShort || (mHead.status >= 200 && !(mHead.status == 401 && mHasLogin));
+    return !mIsCutShort;
+}
+
+/// Whether the login was not good. libcurl would try it once more where the first demand came to
+/// another transfer of the handle, and servers count failures.
+bool CurlExchange::isRefused() const {
+    if (mHead.status != 401) return false;
+    const Ref<HTTPMessage> response = HTTPMessage::response(mHead.status, mHead.headers);
+    const WWWAuthenticate asked(response->getHeader("WWW-Authenticate"));
+    const WWWAuthenticate::Challenge* digest = asked.find("Digest");
+    return !digest || !HTTPMessage::isSameName(digest->getParameter("stale"), "true");
 }
 
 std::size_t CurlExchange::bodyCallback(char* data, std::size_t size, std::size_t count,
                                        void* self) {
     auto& exchange = *static_cast<CurlExchange*>(self);
-    exchange.mHeadIsFinal = exchange.mHeadIsWhole;
-    exchange.mBody.append(data, size * count);
-    return size * count;
+    bool goesOn = false;
+    Foundation::callGuarded(__PRETTY_FUNCTION__, [&] {
+        exchange.mHeadIsFinal = exchange.mHeadIsWhole;
+        exchange.mBody.append(data, size * count);
+        goesOn = true;
+    });
+    return goesOn ? size * count : 0;
 }
 
 std::size_t CurlExchange::readCallback(char* buffer, std::size_t size, std::size_t count,
@@ -264,7 +290,7 @@ int CurlExchange::seekCallback(void* self, long offset, int origin) {
 
 void CurlExchange::finish(int result) {
     mHeadIsFinal = mHeadIsWhole && mHead.status >= 200;
-    mResult = result;
+    mResult = mIsCutShort ? static_cast<int>(CURLE_OK) : result;
 }
 
 bool CurlExchange::hasNews() const {
@@ -311,9 +337,10 @@ std::vector<std::string> CurlExchange::currentCookies() const {
 
 ExchangeEnd CurlExchange::endFor(int result) const {
     if (result == CURLE_OK) return {};
-    if (mHeadIsTooLong) {
-        Foundation::gWarn.log("<%@>: more than %zu bytes of headers", mMessage->getURL(),
-                              ConnectionLimits::kMaxHeaderBytes);
+    // libcurl takes a line that is longer than it likes (100 KiB) for a lack of memory.
+    if (mHeadIsTooLong || (result == CURLE_OUT_OF_MEMORY && !mHeadIsWhole)) {
+        Foundation::gWarn.log("<%@>: more than %zu bytes of headers, or too many in one",
+                              mMessage->getURL(), ConnectionLimits::kMaxHeaderBytes);
         return {NetError(NetError::kPFURL, OVURLErrorBadServerResponse), nullptr};
     }
     long osError = 0;

@@ -59,13 +59,15 @@ class CurlExchange : public Exchange {
     static int seekCallback(void* self, long offset, int origin);
     bool takeHeader(std::string_view line);
     void takeStatusLine(std::string_view line);
-    void takeHeadEnd();
+    bool takeHeadEnd();
+    bool isRefused() const;
     void handOn();
     std::vector<std::string> currentCookies() const;
     ExchangeEnd endFor(int result) const;
 
     CurlTransport& mTransport;
     ExchangeClient& mClient;
+    const bool mIsRepeated;  ///< with a login for the demand that the handle has seen
     Easy mEasy;
     Foundation::Ref<HTTPMessage> mMessage;
     std::unique_ptr<curl_slist, ListDeleter> mHeaderList;
@@ -84,6 +86,7 @@ class CurlExchange : public Exchange {
     bool mHeadIsFinal = false;  ///< libcurl will not try again by itself
     bool mHeadIsSent = false;
     bool mHeadIsTooLong = false;
+    bool mIsCutShort = false;  ///< behind the head, which was all that was wanted
     bool mHasMoved = false;
     std::string mBody;
     std::optional<int> mResult;

@@ -21,6 +21,7 @@ class CurlExchange;
 class CurlTransport : public Transport {
  public:
     CurlTransport();
+    /// REQUIRES: its exchanges have ended.
     ~CurlTransport() override;
 
     std::unique_ptr<Exchange> start(const ExchangeRequest& request, ExchangeClient& client,

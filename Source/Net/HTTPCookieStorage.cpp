@@ -3,6 +3,7 @@
 #include "Foundation/AutoreleasePool.h"
 #include "Foundation/Prefs.h"
 #include "Foundation/UntypedPref.h"
+#include "Net/ConnectionService.h"
 #include "Net/CookieAcceptPolicyObserver.h"
 
 namespace Orvane {
@@ -43,7 +44,11 @@ void HTTPCookieStorage::syncAcceptPolicyWithPreferences() {
     prefs.synchronize();
     const Ref<String> name =
         Foundation::StringReturner(Foundation::UntypedPref(prefs, kAcceptCookiesKey));
-    mAcceptPolicy = policyNamed(String::view(name));
+    ConnectionService::shared().cookies().setAcceptPolicy(policyNamed(String::view(name)));
+}
+
+CookieAcceptPolicy HTTPCookieStorage::cookieAcceptPolicy() const {
+    return ConnectionService::shared().cookies().getAcceptPolicy();
 }
 
 }  // namespace Orvane

@@ -10,8 +10,8 @@ namespace Orvane {
 
 class CookieAcceptPolicyObserver;
 
-/// The user's cookies: whose are kept, as the browser's setting says, also when that changes while
-/// the process runs. Main thread.
+/// The store of the user's cookies, `ConnectionService::cookies`: whose are kept, as the browser's
+/// setting says, also when that changes while the process runs. Main thread.
 class HTTPCookieStorage : public Foundation::RefCounted {
  public:
     /// Made at the first use, and as long as the process.
@@ -21,12 +21,11 @@ class HTTPCookieStorage : public Foundation::RefCounted {
 
     /// Reads the browser's setting anew.
     void syncAcceptPolicyWithPreferences();
-    CookieAcceptPolicy cookieAcceptPolicy() const { return mAcceptPolicy; }
+    CookieAcceptPolicy cookieAcceptPolicy() const;
 
  private:
     HTTPCookieStorage();
 
-    CookieAcceptPolicy mAcceptPolicy = CookieAcceptPolicy::OnlyFromMainDocument;
     std::unique_ptr<CookieAcceptPolicyObserver> mObserver;
 };
 

@@ -3,7 +3,9 @@
 #include "Foundation/AssertionFailure.h"
 #include "Foundation/Guard.h"
 #include "Net/Connection.h"
+#include "Net/MemoryReturn.h"
 #include "Net/RequestQueue.h"
+#include "Net/URLDownload.h"
 
 namespace Orvane {
 
@@ -74,6 +76,7 @@ URLRequest::URLRequest(URL* url) : mURL(url), mClient(std::make_unique<Client>(t
 }
 
 URLRequest::~URLRequest() {
+    if (mResponseData) MemoryReturn::soon(mResponseData->getLength());
     if (!mConnection) return;
     Foundation::gWarn.log("%@ dealloced while connection still open!",
                           static_cast<Foundation::RefCounted*>(this));
@@ -117,6 +120,16 @@ void URLRequest::close() {
     mChallenge = nullptr;
     const Ref<Connection> connection = std::move(mConnection);
     connection->cancel();
+}
+
+Returner<URLDownload> URLRequest::startDownloadToFile(URL* destination) {
+    OV_ASSERT(mResponse);
+    OV_ASSERT(!mResponseData);
+    const Ref<Connection> connection = std::move(mConnection);
+    Ref<URLDownload> download = Returner<URLDownload>::adopted(
+        new URLDownload(connection, mRequest, mResponse, destination));
+    RequestQueue::networkQueue().removeRequest(this);
+    return download;
 }
 
 ConnectionRequest* URLRequest::_getRequest() {
@@ -168,15 +181,13 @@ void URLRequest::_didFail(NetError error) {
 void URLRequest::_didFail(ConnectionError* error) {
     gLogHTTP.log("%@: DidFail (domain=%@, code=%i): %@", this, error->getDomain(), error->getCode(),
                  error);
-    mError = error->toNetError();
-    if (isUnknown(mError) && error->getDomain()->view() == ConnectionError::kNetworkDomain) {
-        mError = NetError(NetError::kPFURL, error->getCode());
-    }
+    mError = error->toLoadingError();
     failed();
 }
 
 void URLRequest::failed() {
     // Half of a body is none.
+    if (mResponseData) MemoryReturn::soon(mResponseData->getLength());
     mResponseData = nullptr;
     stop();
     mFailed.invoke(this);

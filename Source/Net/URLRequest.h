@@ -16,6 +16,7 @@
 namespace Orvane {
 
 class Connection;
+class URLDownload;
 
 /// Fetches a URL, and tells by its actions how that goes. On the thread of the run loop.
 ///
@@ -56,6 +57,15 @@ class URLRequest : public Request {
     /// accepted. Throws `AssertionFailure` if there is none.
     void useAuthenticationCredential(Foundation::String* user, Foundation::String* password,
                                      bool persistent);
+
+    /// Keeps the response and its body in the shared cache, for as long as the server says but no
+    /// less than `minLifetime` seconds; a positive one also overrules a server that wants it not
+    /// kept. Whether it is kept: not if it is empty, or stale within a second.
+    bool cacheResponse(double minLifetime);
+
+    /// Goes on as a download into a file, from `mGotResponse` on and without accumulation; this
+    /// request is then over. Throws `AssertionFailure` before a response and with accumulated data.
+    Foundation::Returner<URLDownload> startDownloadToFile(Foundation::URL* destination);
 
     Foundation::URL* getURL() const { return mURL; }
     /// Null before `mGotResponse`.

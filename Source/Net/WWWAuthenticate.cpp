@@ -66,6 +66,7 @@ void WWWAuthenticate::readElement(std::string_view element) {
     std::string_view name = trimmed(element.substr(0, equals));
     const std::size_t blank = name.find_first_of(kBlanks);
     const bool hasValue = equals < element.size();
+    if (name.find('"') != std::string_view::npos) return;
     if (blank != std::string_view::npos || !hasValue) {
         mChallenges.push_back({std::string(name.substr(0, blank)), {}});
         if (blank == std::string_view::npos) return;

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "Foundation/AutoreleasePool.h"
+#include "Foundation/Bundle.h"
 #include "Foundation/RunLoop.h"
 #include "Net/ConnectionService.h"
 #include "Net/HTTPRequest.h"
@@ -29,7 +30,7 @@ class RequestRecorder {
     }
 
     std::vector<std::string> notes;
-    std::vector<std::string> blocks;
+    std::vector<std::string> blocks;  ///< what was there of the body at each
     bool isOver = false;
 
  private:
@@ -41,7 +42,9 @@ class RequestRecorder {
     }
     void gotData(URLRequest* request) {
         notes.emplace_back("data");
-        blocks.emplace_back(Foundation::Data::asBytes(request->getResponseData()).view());
+        constexpr std::size_t kShort = 65536;
+        const auto data = Foundation::Data::asBytes(request->getResponseData()).view();
+        blocks.emplace_back(data.substr(0, kShort));
     }
     void failed(URLRequest* request) {
         isOver = true;
@@ -65,7 +68,8 @@ class NetTest : public testing::Test {
     NetTest() {
         auto transport = std::make_unique<Support::FakeTransport>();
         mTransport = transport.get();
-        mService = std::make_unique<Orvane::ConnectionService>(std::move(transport));
+        mService = std::make_unique<Orvane::ConnectionService>(std::move(transport),
+                                                               Orvane::ConnectionService::Places());
         Orvane::ConnectionService::setShared(mService.get());
     }
     ~NetTest() noexcept override {
@@ -82,6 +86,10 @@ class NetTest : public testing::Test {
     static Ref<Orvane::HTTPRequest> get(const char* address) {
         return Foundation::Returner<Orvane::HTTPRequest>::adopted(
             new Orvane::HTTPRequest(url(address).get(), text("GET").get()));
+    }
+    static std::string version() {
+        const Ref<Foundation::String> text = Foundation::Bundle::frameworkVersion();
+        return text->utf8();
     }
     /// Serves all that is ready.
     static void turn() {

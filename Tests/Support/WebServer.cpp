@@ -45,8 +45,10 @@ std::string portOf(const ListeningPort& port) {
     return "127.0.0.1:" + std::to_string(port.getNumber());
 }
 
+/// By bash, for other shells know descriptors of one digit only.
 std::unique_ptr<BackgroundProcess> startShell(const std::string& command) {
-    return std::make_unique<BackgroundProcess>(std::vector<std::string>{"/bin/sh", "-c", command});
+    return std::make_unique<BackgroundProcess>(
+        std::vector<std::string>{"/bin/bash", "-c", command});
 }
 
 }  // namespace
