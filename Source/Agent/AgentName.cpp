@@ -10,11 +10,19 @@ namespace Orvane {
 
 using namespace Foundation;
 
+namespace {
+
+constexpr int kTries = 3;
+
+}  // namespace
+
 AgentName::Claim AgentName::claim() {
     Bus& bus = Bus::user();
-    if (bus.requestName(BusCenter::kAgentName)) return Claim::kOurs;
-    if (bus.isConnected() && !bus.getNameOwner(BusCenter::kAgentName).empty()) {
-        return Claim::kTaken;
+    for (int i = 0; i < kTries; ++i) {
+        if (bus.requestName(BusCenter::kAgentName)) return Claim::kOurs;
+        if (!bus.isConnected()) break;
+        // Whoever had it may just have given it up.
+        if (!bus.getNameOwner(BusCenter::kAgentName).empty()) return Claim::kTaken;
     }
     return Claim::kNoBus;
 }

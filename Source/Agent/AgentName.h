@@ -8,7 +8,7 @@ struct AgentName {
     enum class Claim {
         kOurs,
         kTaken,  ///< another process is the agent
-        kNoBus,  ///< nobody can call, and nobody can tell
+        kNoBus,  ///< or one that gives no name: nobody can call, and nobody can tell
     };
 
     static constexpr double kServeSeconds = 10.0;
