@@ -35,6 +35,14 @@ class AgentActivityTest : public AgentTest {
     void end(FeedCore* which, Dictionary* info = nullptr) {
         post(FeedCore::kEndedUpdateLocalNotification, which, info);
     }
+    /// There is an enclosure that is to be downloaded.
+    static void wantDownload() {
+        EnclosureCore::_forgetAutoDownloads();
+        db().execute(
+            "insert into Enclosures (url, downloadAuditStatus, downloadState) values "
+            "('http://example.org/file', %i, %i)",
+            int{EnclosureCore::kApproved}, int{EnclosureCore::kNoDownload});
+    }
     double remaining() const { return task->getQuitTimer().getTimeRemaining(); }
     /// The name and the object of each post that is about feeds.
     Strings told() const {
@@ -111,8 +119,36 @@ TEST_F(AgentActivityTest, WaitsTwoMinutesMoreWhenTheLastRefreshEnds) {
     begin(other);
     end(feed);
     EXPECT_LT(remaining(), 15);
+    EXPECT_FALSE(log.contains("SCHEDULING REFRESH"));
+    log.clear();
     end(other);
     EXPECT_EQ(remaining(), 120.0);
+    // And looks what is next.
+    const Strings lines = agentLines();
+    ASSERT_GE(lines.size(), 3u);
+    EXPECT_EQ(lines[1], "[Agent] Agent will quit after 120 seconds of inactivity.");
+    EXPECT_EQ(lines[2], "[Agent] ===== SCHEDULING REFRESH =====");
+}
+
+TEST_F(AgentActivityTest, LooksForDownloadsWhenTheLastRefreshEnds) {
+    FakeDownloaders downloaders;
+    begin(feed);
+    begin(other);
+    wantDownload();
+    end(feed);
+    EXPECT_EQ(downloaders.calls, "");
+    end(other);
+    EXPECT_EQ(downloaders.calls, "make(1) start ");
+}
+
+TEST_F(AgentActivityTest, GoesOnToTheNextDownloadBeforeItThinksOfTheEnd) {
+    FakeDownloaders downloaders;
+    const double before = remaining();
+    platform.deliver(kStarted, "7", nullptr);
+    wantDownload();
+    platform.deliver(kEnded, "7", nullptr);
+    EXPECT_EQ(downloaders.calls, "make(1) start ");
+    EXPECT_EQ(remaining(), before);
 }
 
 TEST_F(AgentActivityTest, SavesWhenADownloadBeginsAndWhenItEnds) {
