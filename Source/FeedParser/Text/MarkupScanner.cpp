@@ -138,7 +138,7 @@ void MarkupScanner::readDeclaration(MarkupToken& token) {
         if (mSawDocumentType || !isXML() || bracket == npos) return;
         if (!token.content.starts_with("DOCTYPE")) return;
         mSawDocumentType = true;
-        const std::size_t end = mMarkup.find("]", mPosition + bracket);
+        const std::size_t end = mMarkup.find(']', mPosition + bracket);
         const std::size_t close = end == npos ? npos : mMarkup.find('>', end);
         if (close == npos) return;
         token.content = mMarkup.substr(mPosition + 2, close - mPosition - 2);
