@@ -23,8 +23,9 @@ void check(const String* text) {
 void check(const ContentCore* content) {
     if (!content) return;
     check(content->mMIMEType.getValue());
+    // Of a broken binary content nothing is left, not even the data.
     const Data* data = content->mData.getValue();
-    require(data && data->getLength() > 0);
+    require(!data || content->mMIMEType.getValue());
 }
 
 void check(EntryCore& entry) {
