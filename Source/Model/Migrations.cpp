@@ -158,30 +158,30 @@ void addDateOfNewestEntry() {
 }
 
 struct Step {
-    int toMinorVersion;
     void (*run)();
+    int toMinorVersion;
     bool canBeInTransaction = true;
 };
 
 constexpr Step kSteps[] = {
-    {6, addRebuildFlagsAndFormat},
-    {7, addTimeZones},
-    {8, changeNothing},
-    {9, addLinkLocalGUID},
-    {10, addDownloadState},
-    {11, addDownloadAuditStatus},
-    {12, addMonkey},
-    {13, addExpirationDate},
-    {14, addUnreadCount},
-    {15, addHashes},
-    {16, addDateUsed},
-    {17, exchangeIndexes},
-    {18, addRecoverOldEntries},
-    {19, addFOAF},
-    {20, addEnclosureTitle},
+    {addRebuildFlagsAndFormat, 6},
+    {addTimeZones, 7},
+    {changeNothing, 8},
+    {addLinkLocalGUID, 9},
+    {addDownloadState, 10},
+    {addDownloadAuditStatus, 11},
+    {addMonkey, 12},
+    {addExpirationDate, 13},
+    {addUnreadCount, 14},
+    {addHashes, 15},
+    {addDateUsed, 16},
+    {exchangeIndexes, 17},
+    {addRecoverOldEntries, 18},
+    {addFOAF, 19},
+    {addEnclosureTitle, 20},
     // Writing a file anew is a transaction of its own. It may be done again.
-    {21, setIncrementalVacuum, false},
-    {22, addDateOfNewestEntry},
+    {setIncrementalVacuum, 21, false},
+    {addDateOfNewestEntry, 22},
 };
 static_assert(kSteps[0].toMinorVersion == Migrations::kOldestMinorVersion + 1);
 static_assert(std::end(kSteps)[-1].toMinorVersion == Schema::kMinorVersion);
