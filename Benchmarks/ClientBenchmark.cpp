@@ -1,6 +1,10 @@
 // What does it cost to have the agent change a flag of an entry, next to a bare echo by sd-bus that
 // commits the same change with sqlite3?
 //
+// The same for 50 callers at once: what do the slowest calls, one in a hundred, take?
+//
+// The same for 50 callers at once: what do the slowest calls take, one in a hundred?
+//
 // Both sides are processes on one bus. The bare one keeps its statements, and has the settings of
 // the agent's database: a write-ahead log, and each commit on the disk. Both change the flag and
 // its date of one row, and count the unread entries of its feed.
@@ -20,11 +24,16 @@
 #include <sqlite3.h>
 #include <systemd/sd-bus.h>
 
+#include <algorithm>
 #include <csignal>
 #include <cstdio>
+#include <cstdlib>
 #include <filesystem>
+#include <list>
+#include <sstream>
 #include <stdexcept>
 #include <string>
+#include <vector>
 
 using namespace Orvane;
 using Foundation::Bus;
@@ -34,6 +43,10 @@ namespace {
 constexpr int kCalls = 200;
 constexpr int kRounds = 9;
 constexpr int kEntries = 1000;
+constexpr int kCrowd = 50;
+constexpr int kCrowdCalls = 40;
+constexpr int kCrowdRows = 20;  ///< of each caller's own
+constexpr int kCrowdRounds = 3;
 constexpr const char* kBareName = "com.tarnwick.orvane.Bare";
 constexpr const char* kBarePath = "/bare";
 constexpr const char* kProgram = "/proc/self/exe";
@@ -129,21 +142,25 @@ class Caller {
 
     void callAgent() {
         for (int i = 0; i < kCalls; ++i) {
-            const std::int32_t status = RPC::ipc_entry_setRead(mPort, i + 1, mAgentValue);
-            check(status == 0, "the agent failed");
+            callAgent(i + 1, mAgentValue);
         }
         mAgentValue = !mAgentValue;
     }
     void callBare() {
         for (int i = 0; i < kCalls; ++i) {
-            sd_bus_message* reply = nullptr;
-            const int result =
-                sd_bus_call_method(mBus, kBareName, kBarePath, kBareName, "Set", nullptr, &reply,
-                                   "xb", static_cast<std::int64_t>(i + 1), int{mBareValue});
-            sd_bus_message_unref(reply);
-            check(result >= 0, "the bare side failed");
+            callBare(i + 1, mBareValue);
         }
         mBareValue = !mBareValue;
+    }
+    void callAgent(std::int64_t row, bool value) const {
+        check(RPC::ipc_entry_setRead(mPort, row, value) == 0, "the agent failed");
+    }
+    void callBare(std::int64_t row, bool value) const {
+        sd_bus_message* reply = nullptr;
+        const int result = sd_bus_call_method(mBus, kBareName, kBarePath, kBareName, "Set", nullptr,
+                                              &reply, "xb", row, int{value});
+        sd_bus_message_unref(reply);
+        check(result >= 0, "the bare side failed");
     }
 
  private:
@@ -152,6 +169,61 @@ class Caller {
     bool mAgentValue = true;
     bool mBareValue = true;
 };
+
+// Many callers.
+
+/// Waits for the end of the input, calls, and writes what each call took.
+void callMany(bool isBare, int number) {
+    const Foundation::AutoreleasePool pool;
+    const Caller caller;
+    std::printf("ready\n");
+    std::fflush(stdout);
+    while (std::getchar() != EOF) {
+    }
+    for (int i = 0; i < kCrowdCalls; ++i) {
+        const std::int64_t row = number * kCrowdRows + i % kCrowdRows + 1;
+        const bool value = i / kCrowdRows % 2 == 0;
+        std::printf("%.9f ", Benchmarks::secondsOf([&] {
+                        isBare ? caller.callBare(row, value) : caller.callAgent(row, value);
+                    }));
+    }
+    std::printf("\n");
+}
+
+/// What the slowest calls of a crowd take, one in a hundred.
+double slowCallOfCrowd(const char* kind) {
+    std::list<Support::PipedChild> children;
+    for (int i = 0; i < kCrowd; ++i) {
+        children.emplace_back(
+            std::vector<std::string>{kProgram, "--call", kind, std::to_string(i)});
+        check(children.back().readLine() == "ready", "no caller");
+    }
+    for (Support::PipedChild& child : children) {
+        child.closeInput();
+    }
+    std::vector<double> times;
+    for (Support::PipedChild& child : children) {
+        std::istringstream line(child.readLine());
+        for (double seconds = 0; line >> seconds;) {
+            times.push_back(seconds);
+        }
+        check(child.wait() == 0, "a caller failed");
+    }
+    check(times.size() == kCrowd * kCrowdCalls, "a call is lost");
+    std::sort(times.begin(), times.end());
+    return times[times.size() * 99 / 100];
+}
+
+void compareCrowds() {
+    std::vector<double> agent;
+    std::vector<double> bare;
+    for (int i = 0; i < kCrowdRounds; ++i) {
+        agent.push_back(slowCallOfCrowd("agent"));
+        bare.push_back(slowCallOfCrowd("bare"));
+    }
+    const Benchmarks::Comparison slowest{Benchmarks::median(agent), Benchmarks::median(bare)};
+    Benchmarks::report("the slowest of 100 calls, of 50 callers", slowest, 1, "the same, bare");
+}
 
 void run() {
     const Support::TempDir home;
@@ -169,6 +241,7 @@ void run() {
     Caller caller;
     caller.callAgent();
     caller.callBare();
+    compareCrowds();
     const Benchmarks::Comparison calls =
         Benchmarks::compare([&] { caller.callAgent(); }, [&] { caller.callBare(); }, kRounds);
     kill(static_cast<pid_t>(Bus::user().getProcessID(RPC::kServiceName)), SIGTERM);
@@ -180,8 +253,11 @@ void run() {
 
 int main(int argc, char** argv) {
     try {
-        if (argc > 2) {
+        const std::string mode = argc > 1 ? argv[1] : "";
+        if (mode == "--serve") {
             serveBare(argv[2]);
+        } else if (mode == "--call") {
+            callMany(std::string(argv[2]) == "bare", std::atoi(argv[3]));
         } else {
             run();
         }

@@ -5,17 +5,17 @@
 #include "Model/ClientCore.h"
 #include "Model/Schema.h"
 #include "SQLite/Cursor.h"
-#include "Support/TurnUntil.h"
 #include "Utilities/FileSystem.h"
 
 #include <unistd.h>
 
+#include <chrono>
 #include <csignal>
 #include <filesystem>
+#include <stdexcept>
 
 using namespace Foundation;
 using namespace Orvane;
-using Support::turnUntil;
 
 AgentFixture::AgentFixture() {
     SQLite::Database::initialize();
@@ -83,7 +83,14 @@ void AgentFixture::killAgent() {
 }
 
 void AgentFixture::awaitNoAgent() {
-    while (!Bus::user().getNameOwner(RPC::kServiceName).empty()) {
+    await([] { return Bus::user().getNameOwner(RPC::kServiceName).empty(); });
+}
+
+void AgentFixture::await(const std::function<bool()>& condition) {
+    using std::chrono::steady_clock;
+    const auto end = steady_clock::now() + std::chrono::seconds(60);
+    while (!condition()) {
+        if (steady_clock::now() > end) throw std::runtime_error("this never comes");
     }
 }
 

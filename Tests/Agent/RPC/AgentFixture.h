@@ -46,6 +46,9 @@ class AgentFixture : public testing::Test {
     /// Kills the running agent, and waits until the bus has noticed.
     static void killAgent();
     static void awaitNoAgent();
+    /// Waits without turning the loop, so that what the bus has told is not looked at. Throws if it
+    /// takes a minute.
+    static void await(const std::function<bool()>& condition);
     /// The error that a call throws; none if it does not.
     static NetError errorOf(const std::function<void()>& call);
     /// A number that the file has: column 0 of the first row of a query.

@@ -112,11 +112,9 @@ TEST_P(IPCKill, GivesTheErrorAndTheNextCallStartsAnother) {
         if (error != NetError(1002, GetParam().code) && error != NetError::None) {
             EXPECT_EQ(error, NetError(1002, OVIPCError));
         }
-        while (killer.count() == before) {
-        }
+        await([&] { return killer.count() != before; });
         // Until the bus has noticed.
-        while (agent() == killer.lastProcess()) {
-        }
+        await([&] { return agent() != killer.lastProcess(); });
         killer.await("");
         EXPECT_EQ(errorOf([&] { client().setFlags(rows, 1, 1, -1); }), NetError::None);
         EXPECT_EQ(inFile(OVFormat("select read from Entries where rowID=%i", i + 1)), 1);
