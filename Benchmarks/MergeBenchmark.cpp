@@ -1,4 +1,5 @@
 #include "Benchmarks/Measure.h"
+#include "Benchmarks/PlainRows.h"
 #include "FeedParser/DifferenceEngine.h"
 #include "FeedParser/Documents.h"
 #include "FeedParser/EngineMap.h"
@@ -18,12 +19,10 @@
 #include "Utilities/FileSystem.h"
 
 #include <fmt/format.h>
-#include <sqlite3.h>
 
 #include <cstdio>
 #include <exception>
 #include <filesystem>
-#include <map>
 #include <stdexcept>
 #include <string>
 #include <vector>
@@ -46,8 +45,6 @@ constexpr int kEntries = 50;
 constexpr int kTextBytes = 2048;
 constexpr int kFeeds = 1000;
 constexpr int kUnchangedRounds = 301;
-
-constexpr const char* kDoNotWait = "PRAGMA synchronous = OFF";
 
 std::string urlOf(int feed) {
     return fmt::format("http://www.example.org/feeds/{}.xml", feed);
@@ -85,122 +82,6 @@ FeedCore* documentOf(int feed) {
     return parsed;
 }
 
-void require(bool condition, const char* what) {
-    if (!condition) throw std::runtime_error(what);
-}
-
-/// A connection with nothing around sqlite3.
-class Plain {
- public:
-    explicit Plain(const std::string& path) {
-        check(sqlite3_open_v2(path.c_str(), &mDB, SQLITE_OPEN_READWRITE | SQLITE_OPEN_NOMUTEX,
-                              nullptr));
-        run(kDoNotWait);
-    }
-    ~Plain() {
-        for (const auto& [sql, statement] : mStatements) {
-            sqlite3_finalize(statement);
-        }
-        sqlite3_close(mDB);
-    }
-    Plain(const Plain&) = delete;
-    Plain& operator=(const Plain&) = delete;
-
-    void run(const char* sql) { check(sqlite3_exec(mDB, sql, nullptr, nullptr, nullptr)); }
-    /// Compiles and runs a query, and counts its rows.
-    int count(const std::string& sql) {
-        sqlite3_stmt* statement = nullptr;
-        check(sqlite3_prepare_v2(mDB, sql.c_str(), -1, &statement, nullptr));
-        int rows = 0;
-        for (; sqlite3_step(statement) == SQLITE_ROW; ++rows)
-            keep(sqlite3_column_text(statement, 0));
-        check(sqlite3_finalize(statement));
-        return rows;
-    }
-    /// A statement that is compiled once.
-    sqlite3_stmt* statement(const std::string& sql) {
-        sqlite3_stmt*& found = mStatements[sql];
-        if (!found) check(sqlite3_prepare_v2(mDB, sql.c_str(), -1, &found, nullptr));
-        return found;
-    }
-    void insert(sqlite3_stmt* statement, const std::vector<sqlite3_value*>& values) {
-        for (std::size_t i = 0; i < values.size(); ++i) {
-            check(sqlite3_bind_value(statement, static_cast<int>(i) + 1, values[i]));
-        }
-        require(sqlite3_step(statement) == SQLITE_DONE, sqlite3_errmsg(mDB));
-        check(sqlite3_reset(statement));
-    }
-    void check(int result) const { require(result == SQLITE_OK, sqlite3_errmsg(mDB)); }
-
- private:
-    sqlite3* mDB = nullptr;
-    std::map<std::string, sqlite3_stmt*> mStatements;
-};
-
-/// The rows of one table.
-struct Rows {
-    std::string insertSQL;
-    std::vector<std::vector<sqlite3_value*>> rows;
-};
-
-/// Takes copies of the rows of a table that meet a condition.
-Rows take(Plain& file, const char* table, const std::string& condition) {
-    sqlite3_stmt* statement =
-        file.statement(fmt::format("SELECT * FROM {} WHERE {}", table, condition));
-    const int columns = sqlite3_column_count(statement);
-    Rows taken;
-    taken.insertSQL = fmt::format("INSERT INTO {} VALUES (?", table);
-    for (int i = 1; i < columns; ++i)
-        taken.insertSQL += ",?";
-    taken.insertSQL += ")";
-    while (sqlite3_step(statement) == SQLITE_ROW) {
-        std::vector<sqlite3_value*>& row = taken.rows.emplace_back();
-        for (int i = 0; i < columns; ++i)
-            row.push_back(sqlite3_value_dup(sqlite3_column_value(statement, i)));
-    }
-    file.check(sqlite3_reset(statement));
-    return taken;
-}
-
-/// The rows that the merge of a feed's first document has made.
-class ImportedRows {
- public:
-    /// Rows with greater IDs than the last time.
-    ImportedRows(Plain& file, long long feed, long long lastContent)
-        : mFeed(feed),
-          mTables{take(file, "Contents", fmt::format("rowID>{}", lastContent)),
-                  take(file, "Entries", fmt::format("feed={}", feed))} {}
-    ~ImportedRows() {
-        for (const Rows& table : mTables)
-            for (const auto& row : table.rows)
-                for (sqlite3_value* value : row)
-                    sqlite3_value_free(value);
-    }
-    ImportedRows(const ImportedRows&) = delete;
-    ImportedRows& operator=(const ImportedRows&) = delete;
-
-    void insertInto(Plain& file) const {
-        file.run("begin immediate transaction");
-        for (const Rows& table : mTables) {
-            sqlite3_stmt* statement = file.statement(table.insertSQL);
-            for (const auto& row : table.rows)
-                file.insert(statement, row);
-        }
-        file.run(
-            fmt::format("update Feeds set title='News', localDateUpdated=1.0 where rowID={}", mFeed)
-                .c_str());
-        file.run(
-            fmt::format("update Subscriptions set unreadCount={} where feed={}", kEntries, mFeed)
-                .c_str());
-        file.run("commit");
-    }
-    std::size_t count() const { return mTables[0].rows.size() + mTables[1].rows.size(); }
-
- private:
-    long long mFeed;
-    std::vector<Rows> mTables;
-};
-
 /// Makes the process's database with the feeds and their subscriptions, and a copy of its file.
 void makeFiles(const std::string& path, const std::string& plainPath) {
     SQLite::Database::initialize();
@@ -228,8 +109,8 @@ struct Import {
 
 /// Parses and merges the first documents, by turns with inserting the same rows.
 Import measureImport(const std::string& path, const std::string& plainPath) {
-    Plain reader(path);
-    Plain plain(plainPath);
+    Plain reader(path, kDoNotWait);
+    Plain plain(plainPath, kDoNotWait);
     Import total;
     long long lastContent = 0;
     FeedParser::ParserPort parser;
@@ -243,7 +124,7 @@ Import measureImport(const std::string& path, const std::string& plainPath) {
         DifferenceEngine engine(feed, false);
         total.merge.measured += secondsOf([&] { engine.updateFrom(parsed); });
         require(engine.getAddedCount() == kEntries, "entries are missing");
-        const ImportedRows rows(reader, i, lastContent);
+        const ImportedRows rows(reader, i, fmt::format("rowID>{}", lastContent), kEntries);
         require(rows.count() == 3 * kEntries, "rows are missing");
         total.merge.floor += secondsOf([&] { rows.insertInto(plain); });
         lastContent = gDatabase->execScalar("SELECT max(rowID) FROM Contents");
@@ -254,7 +135,7 @@ Import measureImport(const std::string& path, const std::string& plainPath) {
 /// What must be done for a document: the two queries, and a hash for each source.
 class Floor {
  public:
-    Floor(const std::string& path, FeedCore* parsed) : mFile(path) {
+    Floor(const std::string& path, FeedCore* parsed) : mFile(path, kDoNotWait) {
         EngineMap map;
         const Ref<ArrayOf<EntryCore>> entries = parsed->getEntries(nullptr).allRows();
         map.addEntries(entries);

@@ -3,6 +3,7 @@
 #include "Agent/AgentHousekeeping.h"
 #include "FeedParser/ParserPort.h"
 #include "Foundation/Uncopyable.h"
+#include "Net/NetPorts.h"
 
 namespace Orvane {
 
@@ -15,6 +16,7 @@ class AgentPorts : Foundation::Uncopyable {
  private:
     FeedParser::ParserPort mParser;
     AgentHousekeeping mHousekeeping;
+    NetPorts mNet;
 };
 
 }  // namespace Orvane

@@ -11,6 +11,11 @@ constinit MissingPort sMissing{"CredentialStore"};
 
 }  // namespace
 
+void CredentialStore::findInternetPassword(Foundation::URL*, Foundation::String*,
+                                           PasswordHandler found) {
+    found(nullptr);
+}
+
 CredentialStore* CredentialStore::current() {
     if (!sCurrent) sMissing.note();
     return sCurrent;

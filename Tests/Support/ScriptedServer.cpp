@@ -106,6 +106,11 @@ void ScriptedServer::answerBy(const std::string& path, Answerer answerer) {
     mAnswers[path] = std::move(answerer);
 }
 
+void ScriptedServer::answerOthersBy(Answerer answerer) {
+    const Lock lock(mMutex);
+    mOtherAnswers = std::move(answerer);
+}
+
 void ScriptedServer::answerOnce(const std::string& path, ServerAnswer answer) {
     const Lock lock(mMutex);
     mOnce[path].push_back(std::move(answer));
@@ -257,7 +262,8 @@ ServerAnswer ScriptedServer::answerFor(const ServerRequest& request) {
         return answer;
     }
     const auto found = mAnswers.find(request.path());
-    return found == mAnswers.end() ? ServerAnswer(404) : found->second(request);
+    if (found != mAnswers.end()) return found->second(request);
+    return mOtherAnswers ? mOtherAnswers(request) : ServerAnswer(404);
 }
 
 /// Does what can be done now. Whether the connection goes on.

@@ -49,6 +49,8 @@ class ScriptedServer {
     void answer(const std::string& path, ServerAnswer answer);
     /// The same, by a function that is called in the server's thread.
     void answerBy(const std::string& path, Answerer answerer);
+    /// How what has no answer of its own is answered, instead of by 404.
+    void answerOthersBy(Answerer answerer);
     /// How the next request for a path is answered that no other such answer waits for.
     void answerOnce(const std::string& path, ServerAnswer answer);
     /// Lets as many more answers, or repeated waits of one, through a gate, one after the other.
@@ -97,6 +99,7 @@ class ScriptedServer {
 
     mutable std::mutex mMutex;  ///< for all that follows
     std::map<std::string, Answerer> mAnswers;
+    Answerer mOtherAnswers;
     std::map<std::string, std::vector<ServerAnswer>> mOnce;
     std::map<std::string, int> mGates;  ///< how many may pass
     std::map<std::string, int> mWaiting;

@@ -1,0 +1,34 @@
+#include "Support/ProcessMemory.h"
+
+#include <fstream>
+#include <string>
+
+namespace Support {
+
+namespace {
+
+/// A line of the process's status that is in KB.
+std::size_t lineOf(const std::string& name) {
+    std::ifstream status("/proc/self/status");
+    for (std::string word; status >> word;) {
+        std::size_t kilobytes = 0;
+        if (word == name && status >> kilobytes) return kilobytes * 1024;
+    }
+    return 0;
+}
+
+}  // namespace
+
+std::size_t ProcessMemory::now() {
+    return lineOf("VmRSS:");
+}
+
+std::size_t ProcessMemory::peak() {
+    return lineOf("VmHWM:");
+}
+
+void ProcessMemory::forgetPeak() {
+    std::ofstream("/proc/self/clear_refs") << "5";
+}
+
+}  // namespace Support
