@@ -199,5 +199,31 @@ TEST_F(BadServerTest, IsAskedOverFewConnections) {
         EXPECT_EQ(resultOf(*feed), "changed");
     }
     EXPECT_LE(server.getMostConnections(), 6);
-    server.forgetRequests();
+}
+
+TEST_F(BadServerTest, IsAskedWithConditionsFromTheSecondRoundOnOverFourConnections) {
+    constexpr int kFeeds = 200;
+    std::vector<FeedCore*> feeds;
+    for (int i = 0; i < kFeeds; ++i) {
+        const std::string place = "/feed" + std::to_string(i);
+        server.answerBy(place, [place](const ServerRequest& request) {
+            const bool isKnown = request.header("if-none-match") == "\"" + place + "\"";
+            if (isKnown) return ServerAnswer(304);
+            return document(rss(place)).header("ETag", "\"" + place + "\"");
+        });
+        feeds.push_back(&feedOf(place));
+    }
+    for (const char* result : {"changed", "same"}) {
+        server.forgetRequests();
+        for (FeedCore* feed : feeds) {
+            feed->refresh(false, true);
+        }
+        for (FeedCore* feed : feeds) {
+            ASSERT_TRUE(waitForEnd(*feed));
+            ASSERT_EQ(resultOf(*feed), result);
+        }
+        EXPECT_EQ(server.getRequestCount(), kFeeds);
+    }
+    EXPECT_LE(server.getMostConnections(), 4);
+    EXPECT_LE(server.getConnectionCount(), 4);
 }
