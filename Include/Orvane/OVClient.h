@@ -88,13 +88,14 @@ class OV_EXPORT OVClient : public OVObject {
     /// error if there is one, if feeds can't be fetched from there or the agent cannot do it.
     std::shared_ptr<OVFeed> addFeedWithURL(const std::string& url,
                                            std::optional<OVError>* error = nullptr);
-    /// Ends a subscription; the object is a feed in memory then. False for a feed of another
-    /// client, and if the agent cannot do it.
+    /// Ends a subscription; the object is a feed in memory then, as which one may also come. False
+    /// for a feed of another client, and if the agent cannot do it.
     bool removeFeed(const std::shared_ptr<OVFeed>& feed);
     // Null if there is none.
     std::shared_ptr<OVFeed> feedWithURL(const std::string& url) const;
     std::shared_ptr<OVFeed> feedWithIdentifier(const std::string& identifier) const;
-    /// Has the agent refresh all feeds that are due, now. Throws `OVException` if it cannot.
+    /// Has the agent refresh all feeds now, and ask servers for what is new alone, unlike
+    /// `OVFeed::refresh`. Throws `OVException` if it cannot be asked.
     void refreshFeeds();
     /// The same for some of them. A feed in memory is refreshed in this process.
     void refreshFeeds(const std::vector<std::shared_ptr<OVFeed>>& feeds);

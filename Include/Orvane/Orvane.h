@@ -15,6 +15,7 @@
 #include <Orvane/OVException.h>
 #include <Orvane/OVFeed.h>
 #include <Orvane/OVFeedSettings.h>
+#include <Orvane/OVFeedURLUtils.h>
 #include <Orvane/OVFormat.h>
 #include <Orvane/OVLink.h>
 #include <Orvane/OVLog.h>

@@ -87,7 +87,8 @@ std::shared_ptr<OVFeed> OVClient::addFeedWithURL(const std::string& url,
 }
 
 bool OVClient::removeFeed(const std::shared_ptr<OVFeed>& feed) {
-    if (!feed || feed->client().get() != this) return false;
+    const std::shared_ptr<OVClient> owner = feed ? feed->client() : nullptr;
+    if (!feed || (owner && owner.get() != this)) return false;
     return reporting("-[OVClient removeFeed:]", [&] { return feed->_internal()._remove(); });
 }
 

@@ -169,6 +169,9 @@ TEST_F(OVClientTest, RemovesNoFeedOfAnotherClient) {
     EXPECT_EQ(feed->client(), me());
     EXPECT_TRUE(me()->removeFeed(feed));
     EXPECT_FALSE(feed->client());
+    agent->calls.clear();
+    EXPECT_TRUE(me()->removeFeed(feed));
+    EXPECT_TRUE(agent->calls.empty());
 }
 
 TEST_F(OVClientTest, RefreshesFeedsWithoutForce) {
