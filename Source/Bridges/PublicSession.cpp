@@ -9,16 +9,17 @@
 namespace Orvane {
 
 void PublicSession::connect() {
+    if (PublicObjects::current()) return;
     // Never destroyed: rows ask them until the process ends.
     static auto* const sObjects = new PublicObjectFactory;
     static auto* const sParser = new FeedParser::ParserPort;
-    if (!PublicObjects::current()) PublicObjects::setCurrent(sObjects);
-    if (!DocumentParser::current()) DocumentParser::setCurrent(sParser);
+    PublicObjects::setCurrent(sObjects);
+    DocumentParser::setCurrent(sParser);
+    IPCClient::connect();
 }
 
 void PublicSession::open() {
     connect();
-    IPCClient::connect();
     ClientSession::open();
 }
 

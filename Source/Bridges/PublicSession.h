@@ -8,7 +8,7 @@ class PublicSession {
  public:
     /// Opens the session, unless it is open. Throws what `ClientSession::open` does.
     static void open();
-    /// Connects what stands behind the ports, as far as nobody else does.
+    /// Connects what stands behind the ports, once.
     static void connect();
 };
 
