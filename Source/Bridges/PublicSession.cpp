@@ -5,6 +5,7 @@
 #include "FeedParser/ParserPort.h"
 #include "Model/ClientSession.h"
 #include "Model/DocumentParser.h"
+#include "Net/NetPorts.h"
 
 namespace Orvane {
 
@@ -13,6 +14,8 @@ void PublicSession::connect() {
     // Never destroyed: rows ask them until the process ends.
     static auto* const sObjects = new PublicObjectFactory;
     static auto* const sParser = new FeedParser::ParserPort;
+    static const auto* const sNet = new NetPorts;  // connects itself
+    static_cast<void>(sNet);
     PublicObjects::setCurrent(sObjects);
     DocumentParser::setCurrent(sParser);
     IPCClient::connect();
