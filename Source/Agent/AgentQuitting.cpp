@@ -16,6 +16,16 @@ namespace Orvane {
 
 using namespace Foundation;
 
+namespace {
+
+/// Clients may set intervals that no whole number holds.
+std::int64_t wholeSeconds(double seconds) {
+    constexpr double kMost = 9e18;
+    return static_cast<std::int64_t>(std::min(seconds, kMost));
+}
+
+}  // namespace
+
 void AgentTask::resetQuitTimer(double seconds) {
     mQuitTimer.stop();
     if (mDontQuit) return;
@@ -49,7 +59,7 @@ void AgentTask::quit() {
         gLogAgent.log("Oops, start interval of %.1lf is too short", next);
         next = kShortestRest;
     }
-    const auto seconds = static_cast<std::int64_t>(next);
+    const std::int64_t seconds = wholeSeconds(next);
     const Ref<Date> date = Date::nowPlus(static_cast<double>(seconds));
     gLogAgent.log("Agent quitting. Scheduling restart by svcd in %lld seconds (at %@).", seconds,
                   date);

@@ -10,6 +10,7 @@
 #include <cerrno>
 #include <csignal>
 #include <stdexcept>
+#include <utility>
 
 namespace Orvane {
 
@@ -79,15 +80,17 @@ EventQueue::Watch* EventQueue::find(const Event& event) const {
 
 bool EventQueue::add(const Event& event) {
     if (Watch* known = find(event)) {
+        // The kernel has forgotten a descriptor that was closed; its number may be another's now.
+        if (!enter(*known) && errno != EEXIST) return false;
         known->event = event;
+        known->isPaused = false;
         return true;
     }
     auto added = std::make_unique<Watch>(Watch{event, UniqueFD()});
     switch (event.filter) {
         case kRead:
-            return watch(std::move(added), static_cast<int>(event.ident), EPOLLIN);
         case kWrite:
-            return watch(std::move(added), static_cast<int>(event.ident), EPOLLOUT);
+            return keep(std::move(added));
         case kSignal:
             return addSignal(std::move(added));
         default:
@@ -98,22 +101,45 @@ bool EventQueue::add(const Event& event) {
 
 bool EventQueue::addSignal(std::unique_ptr<Watch> added) {
     UniqueFD counter(eventfd(0, EFD_CLOEXEC | EFD_NONBLOCK));
-    const int descriptor = counter.get();
     const int signal = static_cast<int>(added->event.ident);
-    if (!counter || !beginCounting(signal, descriptor)) return false;
+    if (!counter || !beginCounting(signal, counter.get())) return false;
     added->counter = std::move(counter);
-    if (watch(std::move(added), descriptor, EPOLLIN)) return true;
+    if (keep(std::move(added))) return true;
     endCounting(signal);
     return false;
 }
 
-bool EventQueue::watch(std::unique_ptr<Watch> added, int descriptor, std::uint32_t interest) {
-    epoll_event wanted = {};
-    wanted.events = interest;
-    wanted.data.ptr = added.get();
-    if (epoll_ctl(mQueue.get(), EPOLL_CTL_ADD, descriptor, &wanted) != 0) return false;
+bool EventQueue::keep(std::unique_ptr<Watch> added) {
+    if (!enter(*added)) return false;
     mWatches.push_back(std::move(added));
     return true;
+}
+
+int EventQueue::Watch::getDescriptor() const {
+    return counter ? counter.get() : static_cast<int>(event.ident);
+}
+
+/// Has the kernel watch. False, with `errno`, if that cannot be; EEXIST if it does already.
+bool EventQueue::enter(Watch& watch) {
+    epoll_event wanted = {};
+    wanted.events = watch.event.filter == kWrite ? EPOLLOUT : EPOLLIN;
+    wanted.data.ptr = &watch;
+    return epoll_ctl(mQueue.get(), EPOLL_CTL_ADD, watch.getDescriptor(), &wanted) == 0;
+}
+
+void EventQueue::pause(const Event& event) {
+    Watch* watch = find(event);
+    if (!watch || watch->counter || watch->isPaused) return;
+    // Taken out altogether: one that only wants no events is told of hang-ups and errors still.
+    epoll_ctl(mQueue.get(), EPOLL_CTL_DEL, watch->getDescriptor(), nullptr);
+    watch->isPaused = true;
+}
+
+void EventQueue::resume() {
+    for (const auto& watch : mWatches) {
+        // Nothing comes any more from a descriptor that has been closed.
+        if (std::exchange(watch->isPaused, false)) enter(*watch);
+    }
 }
 
 int EventQueue::fetch(Event& event) {

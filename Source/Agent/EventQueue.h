@@ -43,6 +43,10 @@ class EventQueue : Foundation::Uncopyable {
     ///
     /// Descriptors are the caller's. REQUIRES for one that is closed: nobody else holds it open.
     bool add(const Event& event);
+    /// Leaves a descriptor out until `resume`, ready as it may be. Signals are never left out.
+    void pause(const Event& event);
+    /// Reports again what was left out.
+    void resume();
     /// Takes one event, without waiting: 1, 0 if there is none, -1 with `errno`.
     int fetch(Event& event);
 
@@ -50,11 +54,15 @@ class EventQueue : Foundation::Uncopyable {
     struct Watch {
         Event event;
         Foundation::UniqueFD counter;  ///< of a signal's deliveries
+        bool isPaused = false;
+
+        int getDescriptor() const;
     };
 
     Watch* find(const Event& event) const;
-    bool watch(std::unique_ptr<Watch> added, int descriptor, std::uint32_t interest);
+    bool enter(Watch& watch);
     bool addSignal(std::unique_ptr<Watch> added);
+    bool keep(std::unique_ptr<Watch> added);
 
     Foundation::UniqueFD mQueue;
     std::vector<std::unique_ptr<Watch>> mWatches;

@@ -7,6 +7,7 @@
 #include "Foundation/Number.h"
 #include "Foundation/RunLoop.h"
 
+#include <fcntl.h>
 #include <sys/socket.h>
 #include <unistd.h>
 
@@ -25,6 +26,12 @@ namespace {
 constexpr std::size_t kAddressBytes = 128;
 /// What the loop calls for: there is something to read.
 constexpr int kReadCallback = 1;
+
+/// Whoever is gone again when accepted must not keep the loop waiting for the next.
+void makeNonBlocking(int listener) {
+    const int flags = fcntl(listener, F_GETFL);
+    if (flags >= 0) fcntl(listener, F_SETFL, flags | O_NONBLOCK);
+}
 
 EventQueue makeQueue() {
     gLogIPC.log("LaunchListener: initializing");
@@ -127,6 +134,7 @@ bool LaunchListener::registerServerSocket(ServerSocket* socket, const char* name
     bool areAll = true;
     for (std::size_t i = 0; i < listeners->count(); ++i) {
         const auto descriptor = Number::getInteger(listeners->getAs<Number>(i));
+        makeNonBlocking(static_cast<int>(descriptor));
         if (registerEvent(static_cast<std::uintptr_t>(descriptor), EventQueue::kRead,
                           EventQueue::kAdd | EventQueue::kEnable, 0, 0, socket)) {
             gLogIPC.log("LaunchListener listening on fd %i for ServerSocket %p '%s'",
@@ -166,6 +174,7 @@ void LaunchListener::serveEvent() {
         const int error = errno;
         gWarn.log("LaunchListener: could not pick up event.  Error is %d/%s", error,
                   std::strerror(error));
+        pauseAll();
     } else if (count == 0) {
         gLogIPC.log("LaunchListener: no event in kqueue!");
     } else {
@@ -183,7 +192,23 @@ void LaunchListener::serve(const EventQueue::Event& event) {
             break;
         default:
             gWarn.log("LaunchListener: Unknown event; filter=%i", static_cast<int>(event.filter));
+            pause(event);
     }
+}
+
+void LaunchListener::pause(const EventQueue::Event& event) {
+    mEventQueue.pause(event);
+    if (!mPauseTimer.isRunning()) mPauseTimer.start(kPauseSeconds, false);
+}
+
+void LaunchListener::pauseAll() {
+    mEventSource.removeFromLoop();
+    if (!mPauseTimer.isRunning()) mPauseTimer.start(kPauseSeconds, false);
+}
+
+void LaunchListener::resume() {
+    mEventQueue.resume();
+    if (!mEventSource.getLoop()) mEventSource.addTo(RunLoop::current(), RunLoop::kDefaultMode);
 }
 
 void LaunchListener::signalCame(const EventQueue::Event& event) {
@@ -201,6 +226,7 @@ void LaunchListener::acceptConnection(const EventQueue::Event& event) {
         accept4(listener, reinterpret_cast<sockaddr*>(address.data()), &length, SOCK_CLOEXEC));
     if (!connection) {
         gWarn.log("LaunchListener: accept(%i) failed, errno=%i", listener, errno);
+        pause(event);
         return;
     }
     auto* serverSocket = static_cast<ServerSocket*>(event.userData);

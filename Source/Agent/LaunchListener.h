@@ -4,6 +4,7 @@
 #include "Agent/ServiceManager.h"
 #include "Foundation/Array.h"
 #include "Foundation/RunLoopSource.h"
+#include "Foundation/Timer.h"
 
 #include <cstdint>
 #include <memory>
@@ -18,6 +19,11 @@ class ServerSocket;
 class LaunchListener : Foundation::Uncopyable {
  public:
     using Array = Foundation::Array;
+
+    /// For how long something is left alone that goes on being ready though it cannot be served, as
+    /// a connection is for which the process has no descriptor: it would keep the loop from all
+    /// else, and fill the log.
+    static constexpr double kPauseSeconds = 1.0;
 
     /// Made on first use, which must be on the main thread, and destroyed at the process's end.
     static LaunchListener* instance();
@@ -56,10 +62,14 @@ class LaunchListener : Foundation::Uncopyable {
     void serve(const EventQueue::Event& event);
     void signalCame(const EventQueue::Event& event);
     void acceptConnection(const EventQueue::Event& event);
+    void pause(const EventQueue::Event& event);
+    void pauseAll();
+    void resume();
 
     Foundation::Ref<Foundation::Dictionary> mConfigDict;  ///< null if there is no manager
     EventQueue mEventQueue;
     Foundation::FileDescriptorSource mEventSource;
+    Foundation::Timer<LaunchListener> mPauseTimer{this, &LaunchListener::resume};
 };
 
 }  // namespace Orvane

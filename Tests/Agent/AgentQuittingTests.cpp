@@ -65,6 +65,12 @@ TEST_F(AgentQuittingTest, CutsTheSecondsDownToWholeOnes) {
     EXPECT_EQ(quit(), 999);
 }
 
+TEST_F(AgentQuittingTest, ComesBackLateForAnIntervalBeyondCounting) {
+    subscribe("http://example.org/1", clock.now(), 1e300);
+    EXPECT_EQ(quit(), 9000000000000000000);
+    EXPECT_FALSE(log.contains("Oops"));
+}
+
 TEST_F(AgentQuittingTest, LeavesFeedsOutThatAreNeverDue) {
     subscribe("http://example.org/never", clock.now() - 5000, -1);
     EXPECT_EQ(quit(), 31536000);

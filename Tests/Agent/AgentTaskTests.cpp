@@ -227,6 +227,19 @@ TEST_F(AgentTaskTest, ClosesTheDatabaseAtItsEnd) {
     EXPECT_THAT(rows("select title from Feeds"), ElementsAre("unsaved"));
 }
 
+TEST_F(AgentTaskTest, ReportsADatabaseThatCannotBeSavedAtItsEnd) {
+    start();
+    FeedCore* feed = subscribe("http://example.org/1");
+    db().execute(
+        "create trigger Refusal before update on Feeds begin select raise(abort, 'refused'); end");
+    feed->mTitle.setValue(String::string("unsaved"));
+    log.clear();
+    task.reset();
+    EXPECT_TRUE(log.contains("virtual Orvane::AgentTask::~AgentTask()"));
+    EXPECT_EQ(Support::assertionOf([] { AgentTask::sharedInstance(); }), "No AgentTask instance");
+    if (db().isOpen()) db().execute("drop trigger Refusal");
+}
+
 TEST_F(AgentTaskTest, HearsOfNothingAfterItsEnd) {
     start();
     const FeedCore* feed = subscribe("http://example.org/1");

@@ -70,6 +70,51 @@ TEST(EventQueue, ReplacesWhatIsRegisteredAgain) {
     EXPECT_EQ(event.userData, &second);
 }
 
+TEST(EventQueue, LeavesOutWhatIsPaused) {
+    EventQueue queue;
+    Pipe pipe;
+    const EventQueue::Event wanted = on(pipe.readEnd.get(), EventQueue::kRead);
+    ASSERT_TRUE(queue.add(wanted));
+    pipe.put();
+    queue.pause(wanted);
+    EventQueue::Event event;
+    EXPECT_EQ(queue.fetch(event), 0);
+    // Not even a hang-up is reported.
+    pipe.writeEnd.close();
+    EXPECT_EQ(queue.fetch(event), 0);
+    queue.resume();
+    EXPECT_EQ(queue.fetch(event), 1);
+    EXPECT_EQ(event.ident, wanted.ident);
+    // Registered again, it counts at once.
+    queue.pause(wanted);
+    EXPECT_TRUE(queue.add(wanted));
+    EXPECT_EQ(queue.fetch(event), 1);
+}
+
+TEST(EventQueue, LeavesNoSignalOut) {
+    EventQueue queue;
+    const EventQueue::Event wanted = on(SIGUSR1, EventQueue::kSignal);
+    ASSERT_TRUE(queue.add(wanted));
+    queue.pause(wanted);
+    raise(SIGUSR1);
+    EventQueue::Event event;
+    EXPECT_EQ(queue.fetch(event), 1);
+}
+
+TEST(EventQueue, WatchesADescriptorWhoseNumberHasBecomeAnothers) {
+    EventQueue queue;
+    Pipe first;
+    const int number = first.readEnd.get();
+    ASSERT_TRUE(queue.add(on(number, EventQueue::kRead)));
+    first.readEnd.close();
+    const Pipe second;
+    ASSERT_EQ(second.readEnd.get(), number);
+    ASSERT_TRUE(queue.add(on(number, EventQueue::kRead)));
+    second.put();
+    EventQueue::Event event;
+    EXPECT_EQ(queue.fetch(event), 1);
+}
+
 TEST(EventQueue, ReportsWhatCanBeWritten) {
     EventQueue queue;
     const Pipe pipe;

@@ -9,6 +9,7 @@
 
 #include <fcntl.h>
 #include <gmock/gmock.h>
+#include <sys/resource.h>
 #include <sys/socket.h>
 #include <sys/un.h>
 #include <unistd.h>
@@ -38,6 +39,23 @@ class FakeServer : public ServerSocket {
     }
     std::vector<UniqueFD> connections;
     bool throws = false;
+};
+
+/// The process can open nothing more while this lives.
+class NoMoreDescriptors {
+ public:
+    NoMoreDescriptors() {
+        getrlimit(RLIMIT_NOFILE, &mLimit);
+        const UniqueFD next(fcntl(0, F_DUPFD_CLOEXEC, 0));
+        const rlimit full{static_cast<rlim_t>(next.get()), mLimit.rlim_max};
+        setrlimit(RLIMIT_NOFILE, &full);
+    }
+    ~NoMoreDescriptors() { setrlimit(RLIMIT_NOFILE, &mLimit); }
+    NoMoreDescriptors(const NoMoreDescriptors&) = delete;
+    NoMoreDescriptors& operator=(const NoMoreDescriptors&) = delete;
+
+ private:
+    rlimit mLimit = {};
 };
 
 class LaunchListenerTest : public testing::Test {
@@ -82,8 +100,6 @@ class LaunchListenerTest : public testing::Test {
     }
     void make() { listener = std::make_unique<LaunchListener>(services); }
     static void turn() { RunLoop::current().turn(); }
-    /// One turn, for what stays ready.
-    static void turnOnce() { RunLoop::current().runInMode(RunLoop::kDefaultMode, 0, true); }
     /// What was said while the listener was made.
     Strings sayings() {
         log.clear();
@@ -300,7 +316,47 @@ TEST_F(LaunchListenerTest, WantsSomebodyForConnections) {
     EXPECT_EQ(read(client.get(), &byte, 1), 0);
 }
 
+TEST_F(LaunchListenerTest, NeverWaitsForSomeoneWhoHasGone) {
+    const int first = listen("a");
+    ASSERT_EQ(fcntl(first, F_SETFL, fcntl(first, F_GETFL) & ~O_NONBLOCK), 0);
+    give("Render", {first});
+    make();
+    FakeServer server;
+    ASSERT_TRUE(listener->registerServerSocket(&server, "Render"));
+    EXPECT_NE(fcntl(first, F_GETFL) & O_NONBLOCK, 0);
+}
+
+TEST_F(LaunchListenerTest, TriesAgainInASecondIfThereIsNoDescriptorForAConnection) {
+    Support::ManualClock clock;
+    const int socket = listen("a");
+    give("Render", {socket});
+    make();
+    FakeServer server;
+    ASSERT_TRUE(listener->registerServerSocket(&server, "Render"));
+    ASSERT_TRUE(listener->registerSignal(SIGTERM));
+    const UniqueFD client = connectTo("a");
+    const std::string warning =
+        OVFormat("[WARNING] LaunchListener: accept(%i) failed, errno=%i", socket, EMFILE);
+    {
+        const NoMoreDescriptors full;
+        turn();
+        EXPECT_EQ(log.count(warning), 1);
+        // Nothing else waits with it.
+        raise(SIGTERM);
+        turn();
+        EXPECT_TRUE(log.contains("got signal: 15"));
+        clock.advanceBy(0.9);
+        EXPECT_EQ(log.count(warning), 1);
+        clock.advanceBy(0.2);
+        EXPECT_EQ(log.count(warning), 2);
+    }
+    EXPECT_THAT(server.connections, IsEmpty());
+    clock.advanceBy(LaunchListener::kPauseSeconds);
+    EXPECT_EQ(server.connections.size(), 1u);
+}
+
 TEST_F(LaunchListenerTest, SaysIfItCannotAccept) {
+    Support::ManualClock clock;
     int fds[2];
     ASSERT_EQ(pipe2(fds, O_CLOEXEC), 0);
     const UniqueFD readEnd(fds[0]);
@@ -310,9 +366,10 @@ TEST_F(LaunchListenerTest, SaysIfItCannotAccept) {
     listener->registerEvent(static_cast<std::uintptr_t>(readEnd.get()), EventQueue::kRead,
                             EventQueue::kAdd | EventQueue::kEnable, 0, 0, &server);
     ASSERT_EQ(write(writeEnd.get(), "x", 1), 1);
-    turnOnce();
-    EXPECT_TRUE(log.contains(OVFormat("[WARNING] LaunchListener: accept(%i) failed, errno=%i",
-                                      readEnd.get(), ENOTSOCK)));
+    turn();
+    EXPECT_EQ(log.count(OVFormat("[WARNING] LaunchListener: accept(%i) failed, errno=%i",
+                                 readEnd.get(), ENOTSOCK)),
+              1);
     EXPECT_THAT(server.connections, IsEmpty());
 }
 
@@ -341,6 +398,7 @@ TEST_F(LaunchListenerTest, RegistersAllSocketsThatItCan) {
 }
 
 TEST_F(LaunchListenerTest, DoesNotKnowOtherEvents) {
+    Support::ManualClock clock;
     int fds[2];
     ASSERT_EQ(pipe2(fds, O_CLOEXEC), 0);
     const UniqueFD readEnd(fds[0]);
@@ -348,8 +406,10 @@ TEST_F(LaunchListenerTest, DoesNotKnowOtherEvents) {
     make();
     listener->registerEvent(static_cast<std::uintptr_t>(writeEnd.get()), EventQueue::kWrite,
                             EventQueue::kAdd | EventQueue::kEnable, 0, 0, nullptr);
-    turnOnce();
-    EXPECT_TRUE(log.contains("[WARNING] LaunchListener: Unknown event; filter=-2"));
+    turn();
+    EXPECT_EQ(log.count("[WARNING] LaunchListener: Unknown event; filter=-2"), 1);
+    clock.advanceBy(LaunchListener::kPauseSeconds);
+    EXPECT_EQ(log.count("[WARNING] LaunchListener: Unknown event; filter=-2"), 2);
 }
 
 TEST_F(LaunchListenerTest, EndsTheRunAtASignal) {
@@ -377,6 +437,7 @@ TEST_F(LaunchListenerTest, ServesTheDefaultModeAlone) {
 }
 
 TEST_F(LaunchListenerTest, SaysIfAnEventCannotBeHad) {
+    Support::ManualClock clock;
     make();
     ASSERT_TRUE(listener->registerSignal(SIGUSR2));
     // Something else that is always readable stands where the queue was.
@@ -385,11 +446,14 @@ TEST_F(LaunchListenerTest, SaysIfAnEventCannotBeHad) {
     const UniqueFD kept(fcntl(queue, F_DUPFD_CLOEXEC, 0));
     ASSERT_EQ(dup3(other.get(), queue, O_CLOEXEC), queue);
     log.clear();
-    turnOnce();
-    EXPECT_TRUE(
-        log.contains("[WARNING] LaunchListener: could not pick up event.  Error is "
-                     "22/Invalid argument"));
+    turn();
+    EXPECT_EQ(log.count("[WARNING] LaunchListener: could not pick up event.  Error is "
+                        "22/Invalid argument"),
+              1);
     ASSERT_EQ(dup3(kept.get(), queue, O_CLOEXEC), queue);
+    raise(SIGUSR2);
+    clock.advanceBy(LaunchListener::kPauseSeconds);
+    EXPECT_TRUE(log.contains("got signal: 12"));
 }
 
 }  // namespace
