@@ -1,7 +1,6 @@
 #include "Net/BodyReader.h"
 
 #include "Foundation/Logger.h"
-#include "Net/ConnectionLimits.h"
 #include "Net/HTTPMessage.h"
 
 #include <algorithm>
@@ -58,29 +57,30 @@ NetError BodyReader::open() {
 }
 
 NetError BodyReader::take(std::string_view block, const Sink& sink) {
-    mTakenBytes += block.size();
     if (decode(0, block, sink) || mIsRefused) return {};
     return fail(mTrouble.empty() ? "corrupt content coding" : mTrouble);
 }
 
 bool BodyReader::decode(std::size_t step, std::string_view block, const Sink& sink) {
+    if (!count(step, block)) return false;
     if (step < mDecoders.size()) {
         return mDecoders[step]->decode(
             block, [&](std::string_view output) { return decode(step + 1, output, sink); });
     }
-    if (!count(block)) return false;
     if (sink(block)) return true;
     mIsRefused = true;
     return false;
 }
 
-/// Whether the block may come on top of what was given.
-bool BodyReader::count(std::string_view block) {
+/// Whether the block may come on top of what has come to this step. What one coding makes of a body
+/// has its bounds even where the next makes little of it again.
+bool BodyReader::count(std::size_t step, std::string_view block) {
     using namespace ConnectionLimits;
-    mGivenBytes += block.size();
-    if (mIsDocument && mGivenBytes > kMaxDocumentBytes) {
+    mBytes[step] += block.size();
+    const std::size_t bytes = mBytes[step];
+    if (mIsDocument && bytes > kMaxDocumentBytes) {
         mTrouble = OVFormat("a body of more than %zu bytes", kMaxDocumentBytes);
-    } else if (mGivenBytes > kFreeDecodedBytes && mGivenBytes / kMaxDecodedRatio > mTakenBytes) {
+    } else if (bytes > kFreeDecodedBytes && bytes / kMaxDecodedRatio > mBytes[0]) {
         mTrouble =
             OVFormat("a body that decodes to more than %zu times its size", kMaxDecodedRatio);
     }

@@ -2,7 +2,9 @@
 
 #include "Foundation/NetError.h"
 #include "Net/BodyDecoder.h"
+#include "Net/ConnectionLimits.h"
 
+#include <array>
 #include <memory>
 #include <string>
 #include <vector>
@@ -33,15 +35,15 @@ class BodyReader : Foundation::Uncopyable {
 
  private:
     bool decode(std::size_t step, std::string_view block, const Sink& sink);
-    bool count(std::string_view block);
+    bool count(std::size_t step, std::string_view block);
     Foundation::NetError fail(const std::string& what);
 
     const std::string mURL;
     const bool mIsDocument;
     std::vector<std::string> mCodings;  ///< in the order in which they were put on
     std::vector<std::unique_ptr<BodyDecoder>> mDecoders;  ///< in the order in which they come off
-    std::size_t mTakenBytes = 0;
-    std::size_t mGivenBytes = 0;
+    /// What has come to each step: first what was sent, last what it stands for.
+    std::array<std::size_t, ConnectionLimits::kMaxContentCodings + 1> mBytes = {};
     std::string mTrouble;  ///< a bound that was hit
     bool mIsRefused = false;
 };

@@ -120,7 +120,7 @@ void Connection::gotHead(ExchangeHead head) {
     takeCookies(head);
     const Ref<HTTPMessage> message = HTTPMessage::response(head.status, std::move(head.headers));
     const Ref<ConnectionResponse> response = ConnectionResponse::response(
-        &mRequest->message(), message, Foundation::Clock::current().now());
+        &mRequest->message(), message, Foundation::Clock::current().now(), mSentLogin);
     mService.retryTimes().note(*mRequest->getURL(), *message);
     if (followRedirect(response) || askForLogin(response)) return;
     if (mClient) deliver(response);

@@ -18,25 +18,26 @@ bool isCacheableStatus(int status) {
 }
 
 StoragePolicy storagePolicyOf(const HTTPMessage& request, const HTTPMessage& response,
-                              const CacheDirectives& directives) {
+                              const CacheDirectives& directives, bool hasLogin) {
     if (request.getMethod() != "GET" || !isCacheableStatus(response.getStatus()) ||
         !directives.mayBeStored) {
         return StoragePolicy::NotAllowed;
     }
     // What was given to one who had to say who he is does not belong on a disk.
-    if (request.hasHeader("Authorization")) return StoragePolicy::AllowedInMemoryOnly;
+    if (hasLogin || request.hasHeader("Authorization")) return StoragePolicy::AllowedInMemoryOnly;
     return StoragePolicy::Allowed;
 }
 
 }  // namespace
 
 Returner<ConnectionResponse> ConnectionResponse::response(const HTTPMessage* request,
-                                                          HTTPMessage* message, double now) {
+                                                          HTTPMessage* message, double now,
+                                                          bool hasLogin) {
     const CacheDirectives directives = CacheDirectives::of(*message, now);
     Ref<ConnectionResponse> made = Returner<ConnectionResponse>(new ConnectionResponse);
     made->mURL = Ref<Foundation::URL>(request->getURL());
     made->mMessage = Ref<HTTPMessage>(message);
-    made->mStoragePolicy = storagePolicyOf(*request, *message, directives);
+    made->mStoragePolicy = storagePolicyOf(*request, *message, directives, hasLogin);
     made->mExpirationTime = now + directives.lifetime.value_or(0);
     return made;
 }

@@ -16,8 +16,10 @@ class ConnectionResponse : public Foundation::PFRefCounted {
  public:
     /// The response to `request` that `message` is, got at `now`, seconds since 2001. What the
     /// server says of its lifetime (RFC 9111) is read here; where it says none there is none.
+    /// `hasLogin` says that the transport sent a login with the request.
     static Foundation::Returner<ConnectionResponse> response(const HTTPMessage* request,
-                                                             HTTPMessage* message, double now);
+                                                             HTTPMessage* message, double now,
+                                                             bool hasLogin = false);
 
     /// Where it came from, after all redirects.
     Foundation::URL* getURL() const { return mURL; }

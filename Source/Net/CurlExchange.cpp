@@ -9,6 +9,7 @@
 #include "Net/WWWAuthenticate.h"
 
 #include <curl/curl.h>
+#include <sys/socket.h>
 
 #include <algorithm>
 #include <charconv>
@@ -34,6 +35,12 @@ void set(CURL* easy, CURLoption option, Value value) {
     const CURLcode result = curl_easy_setopt(easy, option, value);
     OV_ASSERT_MESSAGE(result == CURLE_OK, "libcurl: option %d: %s", static_cast<int>(option),
                       curl_easy_strerror(result));
+}
+
+/// libcurl's own sockets would be handed on to the processes that this one starts.
+curl_socket_t openSocket(void*, curlsocktype, curl_sockaddr* address) {
+    const int fd = ::socket(address->family, address->socktype | SOCK_CLOEXEC, address->protocol);
+    return fd < 0 ? CURL_SOCKET_BAD : fd;
 }
 
 std::string_view trimmed(std::string_view text) {
@@ -107,6 +114,7 @@ void CurlExchange::setUp(const ExchangeRequest& request) {
     set(easy, CURLOPT_PRIVATE, this);
     set(easy, CURLOPT_ERRORBUFFER, mErrorText.data());
     set(easy, CURLOPT_NOSIGNAL, 1L);
+    set(easy, CURLOPT_OPENSOCKETFUNCTION, &openSocket);
     set(easy, CURLOPT_CONNECTTIMEOUT, kNoConnectTimeoutSeconds);
     // A name server that does not answer must not keep the loop waiting for a transfer's end.
     set(easy, CURLOPT_QUICK_EXIT, 1L);

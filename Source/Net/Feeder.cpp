@@ -38,11 +38,13 @@ void Feeder::removed() {
 bool Feeder::refresh(bool force, bool queued) {
     if (mRefreshing) return true;
     if (!mFeed) return false;
+    const Ref<Feeder> alive(this);
     mForce = force;
     mQueued = queued;
     mStatus = NetError::None;
     mLinks = nullptr;
-    if (!doRefresh()) {
+    // Who hears that it fetches may remove the feed.
+    if (!doRefresh() || !mFeed) {
         mForce = false;
         return false;
     }

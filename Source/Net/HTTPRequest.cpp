@@ -26,9 +26,9 @@ bool isPermanent(int status) {
 
 HTTPRequest::HTTPRequest(URL* url, String* method) : URLRequest(url), mMethod(method) {
     OV_ASSERT(method);
-    gLogHTTP.log("Init HTTPRequest %p to %@ <%@>", static_cast<const void*>(this), mMethod, mURL);
     const Ref<String> name = String::string("User-Agent");
     setHeader(name, userAgent());
+    gLogHTTP.log("Init HTTPRequest %p to %@ <%@>", static_cast<const void*>(this), mMethod, mURL);
 }
 
 HTTPRequest::~HTTPRequest() = default;

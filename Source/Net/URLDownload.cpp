@@ -93,6 +93,12 @@ void URLDownload::stop() {
     connection->cancel();
 }
 
+void URLDownload::createFile() {
+    // Those who hear of it may let it go.
+    const Ref<URLDownload> self(this);
+    createFileIfNeeded();
+}
+
 bool URLDownload::createFileIfNeeded() {
     mCreateTimer.stop();
     if (mFile) return true;

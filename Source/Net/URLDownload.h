@@ -52,7 +52,7 @@ class URLDownload : public Foundation::RefCounted {
 
     /// False, with the end of the download, if there can be no file.
     bool createFileIfNeeded();
-    void createFile() { createFileIfNeeded(); }
+    void createFile();
     void _chooseDestinationForFilename(Foundation::String* name);
     void _didReceiveData(std::string_view block);
     void _didFinish(Foundation::NetError error);

@@ -202,6 +202,17 @@ TEST_F(BodyReaderTest, UndoesSeveralCodingsFromTheLastOn) {
     EXPECT_EQ(read("br, gzip", body).second, kBad);
 }
 
+TEST_F(BodyReaderTest, BoundsWhatStandsBetweenTwoCodings) {
+    const std::string empty = Support::gzipped("");
+    std::string many;
+    while (many.size() < 16 * kMiB) {
+        many += empty;
+    }
+    EXPECT_EQ(read("gzip, gzip", Support::gzipped(many)),
+              (std::pair<std::size_t, NetError>{0, kBad}));
+    EXPECT_TRUE(mLog.contains("<http://a/>: a body that decodes to more than 200 times its size"));
+}
+
 TEST_F(BodyReaderTest, RefusesMoreThanThreeCodings) {
     EXPECT_EQ(read("gzip,gzip,gzip,gzip", "").second, kBad);
     EXPECT_TRUE(mLog.contains("<http://a/>: more than 3 content codings"));

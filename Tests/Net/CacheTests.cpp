@@ -52,6 +52,21 @@ TEST_F(CacheTest, KeepsTheServersLifetime) {
     EXPECT_EQ(fetch(), "sent");
 }
 
+TEST_F(CacheTest, KeepsInMemoryWhatTookALogin) {
+    network().answer("http://a/",
+                     {.status = 401, .headers = {{"WWW-Authenticate", "Basic realm=\"x\""}}});
+    network().answer("http://a/", {.headers = {{"Cache-Control", "max-age=90"}}, .body = "secret"});
+    mRequest = get("http://a/");
+    mRequest->setStoredCredential(text("ann").get(), text("pass").get());
+    mRequest->start(true);
+    turn();
+    EXPECT_EQ(mRequest->getResponseData()->view(), "secret");
+    EXPECT_EQ(mRequest->getResponse()->getRecommendedStoragePolicy(),
+              StoragePolicy::AllowedInMemoryOnly);
+    EXPECT_TRUE(mRequest->cacheResponse(0.0));
+    EXPECT_EQ(fetch(), "secret");
+}
+
 TEST_F(CacheTest, KeepsNothingForLessThanASecond) {
     const Support::LoggingOn on({&gLogHTTP});
     const Support::LogCapture log;

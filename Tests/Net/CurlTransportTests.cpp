@@ -9,6 +9,10 @@
 #include "Support/TurnUntil.h"
 #include "Support/WebServer.h"
 
+#include <fcntl.h>
+#include <netinet/in.h>
+#include <sys/socket.h>
+
 #include <algorithm>
 #include <fstream>
 #include <optional>
@@ -92,6 +96,20 @@ class CurlTransportTest : public testing::Test {
         EXPECT_LT(memory("VmRSS:"), before + 16 * kMiB);
     }
 
+    /// The flags of the descriptors of this process that are connected to the server.
+    std::vector<int> connectionFlags() const {
+        constexpr int kMaxDescriptor = 1024;
+        std::vector<int> flags;
+        for (int fd = 0; fd < kMaxDescriptor; ++fd) {
+            sockaddr_in peer = {};
+            socklen_t length = sizeof peer;
+            if (getpeername(fd, reinterpret_cast<sockaddr*>(&peer), &length) != 0) continue;
+            if (peer.sin_family != AF_INET || ntohs(peer.sin_port) != mServer.getPort()) continue;
+            flags.push_back(fcntl(fd, F_GETFD));
+        }
+        return flags;
+    }
+
     Foundation::AutoreleasePool mPool;
     FakeCenter mCenter;
     Support::ManualClock mClock;
@@ -119,6 +137,12 @@ TEST_F(CurlTransportTest, KeepsConnections) {
     }
     EXPECT_EQ(mServer.getConnectionCount(), 1);
     EXPECT_EQ(mServer.getRequestCount(), 6);
+}
+
+TEST_F(CurlTransportTest, HandsNoConnectionOnToProcessesItStarts) {
+    mServer.answer("/a", ServerAnswer().body("x"));
+    EXPECT_EQ(fetch(mServer.url("/a")), "finished");
+    EXPECT_EQ(connectionFlags(), std::vector<int>{FD_CLOEXEC});
 }
 
 TEST_F(CurlTransportTest, MakesNoMoreThanSixConnectionsToAHost) {

@@ -141,6 +141,20 @@ TEST_F(FeederTest, EndsWithItsFeed) {
     EXPECT_EQ(error, NetError::None);
 }
 
+TEST_F(FeederTest, DoesNotBeginWhereItsFeedEndsAsTheFetchDoes) {
+    struct Remover {
+        FeedCore& feed;
+        void fetching(FeedRefresher*) { feed.removeFeeder(); }
+    } remover{*feed};
+    const Ref<PollingFeeder> held(feeder);
+    held->mFetchStarted.setReceiver(receiver(&remover, &Remover::fetching));
+    EXPECT_FALSE(held->refresh(true, false));
+    EXPECT_FALSE(held->isRefreshing());
+    EXPECT_EQ(recorder->notes, "");
+    turn();
+    EXPECT_EQ(network().asked().size(), 0U);
+}
+
 TEST_F(FeederTest, LogsHowItBeginsAndEnds) {
     const Support::LoggingOn on({&gLogFeed});
     refresh({304});

@@ -56,7 +56,10 @@ TEST_F(HTTPRequestTest, LogsWhatIsMadeAndSet) {
     const Support::LogCapture log;
     const auto request = get("http://a/");
     const std::string pointer = OVFormat("%p", static_cast<const void*>(request.get()));
-    EXPECT_TRUE(log.contains("[HTTP] Init HTTPRequest " + pointer + " to GET <http://a/>"));
+    ASSERT_EQ(log.lines().size(), 2u);
+    EXPECT_EQ(log.lines()[0], "[HTTP] HTTPRequest " + pointer +
+                                  ": Set header: User-Agent: Tarnwick-Orvane/" + version());
+    EXPECT_EQ(log.lines()[1], "[HTTP] Init HTTPRequest " + pointer + " to GET <http://a/>");
     request->setHeader(text("X-One").get(), text("1").get());
     EXPECT_TRUE(log.contains("[HTTP] HTTPRequest " + pointer + ": Set header: X-One: 1"));
 }

@@ -42,6 +42,14 @@ class URLDownloadTest : public NetTest {
         mNotes.push_back(OVFormat("failed %d %d", static_cast<int>(download->getError().domain),
                                   download->getError().code));
     }
+    void letGoWhenItTells() {
+        mDownload->mCreatedFile.setReceiver(receiver(this, &URLDownloadTest::letGo));
+        mDownload->mFailed.setReceiver(receiver(this, &URLDownloadTest::letGo));
+    }
+    void letGo(URLDownload*) {
+        mDownload = nullptr;
+        mNotes.emplace_back("let go");
+    }
     void finished(URLDownload*) { mNotes.emplace_back("finished"); }
 
     Support::TempDir mDirectory;
@@ -107,6 +115,17 @@ TEST_F(URLDownloadTest, FailsWhereThereCanBeNoFile) {
     EXPECT_TRUE(network().pending().empty());
     turn();
     EXPECT_EQ(mNotes.size(), 1u);
+}
+
+TEST_F(URLDownloadTest, MayBeLetGoByWhoHearsOfItsFile) {
+    for (const char* path : {"file", "missing/file"}) {
+        begin(mDirectory / path);
+        letGoWhenItTells();
+        turn();
+        EXPECT_EQ(mDownload.get(), nullptr);
+        EXPECT_TRUE(network().pending().empty());
+    }
+    EXPECT_EQ(mNotes, (Notes{"let go", "let go"}));
 }
 
 TEST_F(URLDownloadTest, CanBeResumedWhereTheServerSaysSo) {
