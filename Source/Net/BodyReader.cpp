@@ -13,6 +13,7 @@ using Foundation::NetError;
 namespace {
 
 constexpr int kPartialContent = 206;
+constexpr int kFirstRedirect = 300;
 
 /// The elements of a list of tokens, but for "identity", which is no coding.
 std::vector<std::string> codingsIn(std::string_view list) {
@@ -36,7 +37,9 @@ std::vector<std::string> codingsIn(std::string_view list) {
 }  // namespace
 
 BodyReader::BodyReader(std::string url, const HTTPMessage& response, bool isDocument)
-    : mURL(std::move(url)), mIsDocument(isDocument) {
+    : mURL(std::move(url)),
+      mIsDocument(isDocument),
+      mIsSuccess(response.getStatus() < kFirstRedirect) {
     // A part of a coded file cannot be decoded alone.
     if (!isDocument && response.getStatus() == kPartialContent) return;
     mCodings = codingsIn(response.getHeader("Content-Encoding"));
@@ -45,13 +48,21 @@ BodyReader::BodyReader(std::string url, const HTTPMessage& response, bool isDocu
 BodyReader::~BodyReader() = default;
 
 NetError BodyReader::open() {
+    mTrouble = findDecoders();
+    if (mTrouble.empty()) return {};
+    mDecoders.clear();
+    // What is not asked for its body is good for its status, as long as no body comes.
+    return mIsSuccess ? fail(mTrouble) : NetError();
+}
+
+/// What is wrong with the codings; empty for nothing.
+std::string BodyReader::findDecoders() {
     if (mCodings.size() > ConnectionLimits::kMaxContentCodings) {
-        return fail(
-            OVFormat("more than %zu content codings", ConnectionLimits::kMaxContentCodings));
+        return OVFormat("more than %zu content codings", ConnectionLimits::kMaxContentCodings);
     }
     for (auto coding = mCodings.rbegin(); coding != mCodings.rend(); ++coding) {
         mDecoders.push_back(BodyDecoder::forCoding(*coding));
-        if (!mDecoders.back()) return fail(OVFormat("unknown content coding \"%s\"", *coding));
+        if (!mDecoders.back()) return OVFormat("unknown content coding \"%s\"", *coding);
     }
     return {};
 }

@@ -26,7 +26,8 @@ class BodyReader : Foundation::Uncopyable {
     BodyReader(std::string url, const HTTPMessage& response, bool isDocument);
     ~BodyReader();
 
-    /// Whether the codings are known.
+    /// Whether the codings are known. A response that stands for no success may have any until a
+    /// block of its body is taken.
     Foundation::NetError open();
     /// Hands what a block stands for to the sink. No error if the sink wants no more.
     Foundation::NetError take(std::string_view block, const Sink& sink);
@@ -34,17 +35,19 @@ class BodyReader : Foundation::Uncopyable {
     Foundation::NetError finish();
 
  private:
+    std::string findDecoders();
     bool decode(std::size_t step, std::string_view block, const Sink& sink);
     bool count(std::size_t step, std::string_view block);
     Foundation::NetError fail(const std::string& what);
 
     const std::string mURL;
     const bool mIsDocument;
+    const bool mIsSuccess;
     std::vector<std::string> mCodings;  ///< in the order in which they were put on
     std::vector<std::unique_ptr<BodyDecoder>> mDecoders;  ///< in the order in which they come off
     /// What has come to each step: first what was sent, last what it stands for.
     std::array<std::size_t, ConnectionLimits::kMaxContentCodings + 1> mBytes = {};
-    std::string mTrouble;  ///< a bound that was hit
+    std::string mTrouble;  ///< a bound that was hit, or codings that nobody can undo
     bool mIsRefused = false;
 };
 

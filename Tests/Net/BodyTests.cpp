@@ -257,6 +257,27 @@ TEST_F(CodedRequestTest, FailsWithoutDataWhereACodingIsTruncated) {
     EXPECT_EQ(request->getResponseData(), nullptr);
 }
 
+TEST_F(CodedRequestTest, TellsTheStatusWhateverTheCoding) {
+    network().answer(
+        "http://a/",
+        {.status = 404, .headers = {{"Content-Encoding", "utf-8"}}, .body = "not here"});
+    const auto request = get("http://a/");
+    const RequestRecorder recorder(*request);
+    request->start(true);
+    turn();
+    EXPECT_EQ(recorder.notes,
+              (std::vector<std::string>{"opened", "response 404", "failed 15 -1011"}));
+}
+
+TEST_F(CodedRequestTest, MindsNoCodingWhereThereIsNoBody) {
+    network().answer("http://a/", {.status = 304, .headers = {{"Content-Encoding", "utf-8"}}});
+    const auto request = get("http://a/");
+    const RequestRecorder recorder(*request);
+    request->start(true);
+    turn();
+    EXPECT_EQ(recorder.notes, (std::vector<std::string>{"opened", "response 304", "finished"}));
+}
+
 TEST_F(CodedRequestTest, AsksForNoCodingOfAFile) {
     const auto request = get("http://a/");
     request->setAccumulatesData(false);
