@@ -1,9 +1,13 @@
 // The agent as a process: how it is started, and how it ends.
 
 #include "Agent/AgentProcess.h"
+#include "Agent/RPC/AgentService.h"
+#include "Foundation/AutoreleasePool.h"
 #include "Foundation/Bus.h"
 #include "Foundation/BusCenter.h"
+#include "Foundation/BusConnection.h"
 #include "Foundation/UniqueFD.h"
+#include "SQLite/Database.h"
 #include "Support/ChildProcess.h"
 #include "Support/FileAccess.h"
 #include "Support/PrivateBus.h"
@@ -23,6 +27,7 @@
 #include <vector>
 
 using namespace Foundation;
+namespace RPC = Orvane::RPC;
 using Support::BackgroundProcess;
 using Support::ChildResult;
 using Support::EnvVar;
@@ -159,6 +164,35 @@ TEST_F(AgentProcess, GoesOnWithoutABus) {
     ASSERT_TRUE(hasLogged(kRunning)) << log();
     EXPECT_THAT(log(), HasSubstr("No message bus: the agent goes on, but nobody can call it"));
     EXPECT_EQ(end(SIGTERM), 0);
+}
+
+TEST_F(AgentOnBus, ServesWhatCameBeforeItEnds) {
+    start();
+    std::string error;
+    const auto peer = BusConnection::open(bus.getAddress(), error);
+    ASSERT_TRUE(peer) << error;
+    // While it stands still, a call reaches it, and behind that the word to end.
+    kill(agent->getPID(), SIGSTOP);
+    BusConnection::Messages came;
+    BusMessage call = peer->newCall({.destination = RPC::kServiceName,
+                                     .path = RPC::kObjectPath,
+                                     .interface = RPC::kInterface,
+                                     .member = "client_create"});
+    call.append("org.example.Reader");
+    ASSERT_TRUE(peer->send(call, came));
+    BusMessage question = peer->newCall({.destination = "org.freedesktop.DBus",
+                                         .path = "/org/freedesktop/DBus",
+                                         .interface = "org.freedesktop.DBus",
+                                         .member = "GetId"});
+    ASSERT_TRUE(peer->call(question, 60).isValid());
+    kill(agent->getPID(), SIGTERM);
+    EXPECT_EQ(end(SIGCONT), 0);
+
+    // What the call did has been saved.
+    const AutoreleasePool pool;
+    SQLite::Database file;
+    file.open(database().c_str(), false);
+    EXPECT_EQ(file.execScalar("select count(*) from Clients"), 1) << log();
 }
 
 TEST_F(AgentOnBus, WaitsForTheAgentBeforeItToClose) {
