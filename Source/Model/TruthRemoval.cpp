@@ -4,6 +4,7 @@
 #include "Foundation/Clock.h"
 #include "Foundation/Logger.h"
 #include "Foundation/Ref.h"
+#include "Foundation/RunOnceTimer.h"
 #include "Foundation/URL.h"
 #include "Model/FeedCore.h"
 #include "SQLite/Database.h"
@@ -55,6 +56,25 @@ void finishOne(URL* left) {
     gWarn.log("Could not put the directory %@ back as %@: %@", left, place, error);
 }
 
+/// Deletes a directory whose feed is being deleted, once that is committed.
+class LaterDeletion : public Foundation::RefCounted {
+ public:
+    explicit LaterDeletion(URL* renamed) : mRenamed(renamed) {}
+    void begin() { finishOne(mRenamed.get()); }
+
+ private:
+    Ref<URL> mRenamed;
+};
+
+/// The files of a feed whose deletion may still fail, or be cut off, are let alone until then.
+void deleteWhenCommitted(URL* renamed) {
+    if (!SQLite::gDatabase || !SQLite::gDatabase->isInTransaction()) {
+        return FileUtils::asyncDeleteDirectory(renamed);
+    }
+    const Ref<LaterDeletion> deletion = new LaterDeletion(renamed);
+    Foundation::callAfterDelay(0.0, deletion.get(), &LaterDeletion::begin);
+}
+
 }  // namespace
 
 void TruthRemoval::remove(const FeedCore* feed, URL* directory) {
@@ -63,7 +83,7 @@ void TruthRemoval::remove(const FeedCore* feed, URL* directory) {
     const Ref<URL> renamed = directory->byAppendingExtension(extension);
     NetError error;
     if (FileUtils::move(directory, renamed, error)) {
-        FileUtils::asyncDeleteDirectory(renamed);
+        deleteWhenCommitted(renamed);
     } else {
         gWarn.log("Could not take the directory %@ of %@ away: %@", directory, feed, error);
     }

@@ -12,7 +12,9 @@ class FeedCore;
 /// "deleted.at." with the time in seconds, and deleted under that name on the thread of
 /// `FileDeletionQueue`.
 struct TruthRemoval {
-    /// Takes the directory of a feed away. That it cannot be draws a warning.
+    /// Takes the directory of a feed away. That it cannot be draws a warning. Within a transaction
+    /// its files stay until the loop's next turn, and it gets its name back if the feed is still
+    /// there then, as by `finish`.
     static void remove(const FeedCore* feed, Foundation::URL* directory);
 
     /// Deals with what an earlier process has left under such names. It is deleted, but for the

@@ -1,11 +1,14 @@
 #include "Model/MinistryOfTruth.h"
 
 #include "Model/StorageTest.h"
+#include "SQLite/Transaction.h"
 #include "Support/FileAccess.h"
 #include "Support/TurnUntil.h"
 #include "Utilities/FileUtils.h"
 
 #include <gmock/gmock.h>
+
+#include <stdexcept>
 
 using namespace Foundation;
 using namespace Orvane;
@@ -111,6 +114,38 @@ TEST_F(TruthDirectoryTest, IsTakenAwayAtOnceAndDeleted) {
     waitUntilDeleted();
     EXPECT_FALSE(has("Feeds/abc.deleted.at.788918400.000000"));
     EXPECT_TRUE(has("Feeds/abcd/1.xml"));
+}
+
+TEST_F(TruthDirectoryTest, KeepsItsFilesUntilTheDeletionOfItsFeedIsCommitted) {
+    makeFeed("abc", false);
+    writeFile("Feeds/abc/1.xml", "<item/>");
+    ministry().openDatabase();
+    {
+        const SQLite::Transaction transaction(true);
+        ministry().deleteTruthDirectoryForFeed(nullptr, urlOf("Feeds/abc", true));
+        EXPECT_FALSE(FileUtils::isDeletingFilesAsynchronously());
+        EXPECT_TRUE(has("Feeds/abc.deleted.at.788918400.000000/1.xml"));
+        db().execute("delete from Entries");
+        db().execute("delete from Feeds");
+    }
+    EXPECT_TRUE(Support::turnUntil([&] { return !has("Feeds/abc.deleted.at.788918400.000000"); }));
+    EXPECT_FALSE(has("Feeds/abc"));
+    waitUntilDeleted();
+}
+
+TEST_F(TruthDirectoryTest, ComesBackWhereTheDeletionOfItsFeedFails) {
+    makeFeed("abc", false);
+    writeFile("Feeds/abc/1.xml", "<item/>");
+    ministry().openDatabase();
+    try {
+        const SQLite::Transaction transaction(true);
+        ministry().deleteTruthDirectoryForFeed(nullptr, urlOf("Feeds/abc", true));
+        EXPECT_FALSE(has("Feeds/abc"));
+        throw std::runtime_error("no commit");
+    } catch (const std::runtime_error&) {
+        EXPECT_TRUE(Support::turnUntil([&] { return has("Feeds/abc"); }));
+    }
+    EXPECT_EQ(readFile("Feeds/abc/1.xml"), "<item/>");
 }
 
 TEST_F(TruthDirectoryTest, HasTheTimeInTheNameThatItIsDeletedUnder) {
