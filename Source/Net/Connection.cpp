@@ -14,7 +14,6 @@ namespace Orvane {
 using Foundation::NetError;
 using Foundation::Ref;
 using Foundation::Returner;
-using Foundation::String;
 
 Connection::Connection(const ConnectionRequest* request, ConnectionClient* client)
     : mService(ConnectionService::shared()),
@@ -103,6 +102,7 @@ bool Connection::mayUseLogin() const {
 }
 
 void Connection::restartTimers() {
+    mIsLastChance = false;
     mStallTimer.start(mRequest->getTimeout(), false);
     if (mRequest->isDocument() && !mTotalTimer.isRunning()) {
         mTotalTimer.start(ConnectionLimits::kMaxDocumentSeconds, false);
@@ -183,9 +183,8 @@ void Connection::takeCookies(const ExchangeHead& head) {
 void Connection::deliver(ConnectionResponse* response) {
     mPhase = Phase::Body;
     keepLogin(*response);
-    const Ref<String> url = response->getURL()->getAbsoluteString();
-    mReader = std::make_unique<BodyReader>(url->utf8(), *response->getHTTPMessage(),
-                                           mRequest->isDocument());
+    mReader = std::make_unique<BodyReader>(mRequest->message().getPlace(),
+                                           *response->getHTTPMessage(), mRequest->isDocument());
     if (const NetError error = mReader->open(); error.code != 0) return fail(error);
     mClient->didReceiveResponse(response);
 }
@@ -214,14 +213,14 @@ void Connection::timedOut() {
         mExchange.reset();
         return sendNext();
     }
-    Foundation::gWarn.log("<%@>: no byte in %.0f seconds", mRequest->getURL(),
+    Foundation::gWarn.log("<%s>: no byte in %.0f seconds", mRequest->message().getPlace(),
                           mRequest->getTimeout());
     fail(NetError(NetError::kPFURL, OVURLErrorTimedOut));
 }
 
 void Connection::tookTooLong() {
     const Ref<Connection> self(this);
-    Foundation::gWarn.log("<%@>: not complete in %.0f seconds", mRequest->getURL(),
+    Foundation::gWarn.log("<%s>: not complete in %.0f seconds", mRequest->message().getPlace(),
                           ConnectionLimits::kMaxDocumentSeconds);
     fail(NetError(NetError::kPFURL, OVURLErrorTimedOut));
 }

@@ -62,7 +62,7 @@ bool Connection::followRedirect(ConnectionResponse* response) {
     const HTTPMessage& message = *response->getHTTPMessage();
     if (!isRedirect(message.getStatus()) || !message.hasHeader("Location")) return false;
     if (++mRedirects > ConnectionLimits::kMaxRedirects) {
-        Foundation::gWarn.log("<%@>: more than %d redirects", mRequest->getURL(),
+        Foundation::gWarn.log("<%s>: more than %d redirects", mRequest->message().getPlace(),
                               ConnectionLimits::kMaxRedirects);
         fail(NetError(NetError::kPFURL, OVURLErrorTooManyRedirects));
         return true;
@@ -73,7 +73,7 @@ bool Connection::followRedirect(ConnectionResponse* response) {
         return true;
     }
     if (!isHTTP(*target)) {
-        Foundation::gWarn.log("<%@>: redirects to <%@>", mRequest->getURL(), target);
+        Foundation::gWarn.log("<%s>: redirects to <%@>", mRequest->message().getPlace(), target);
         fail(NetError(NetError::kPFURL, OVURLErrorUnsupportedURL));
         return true;
     }

@@ -31,7 +31,8 @@ bool Connection::answerForHost() {
     if (!refusal) return false;
     const double now = Foundation::Clock::current().now();
     const double seconds = std::ceil(refusal->until - now);
-    gLogHTTP.log("<%@>: not asked for another %.0f seconds", mRequest->getURL(), seconds);
+    gLogHTTP.log("<%s>: not asked for another %.0f seconds", mRequest->message().getPlace(),
+                 seconds);
     const Ref<HTTPMessage> message =
         HTTPMessage::response(refusal->status, {{"Retry-After", OVFormat("%.0f", seconds)}});
     const Ref<ConnectionResponse> response =

@@ -347,8 +347,8 @@ ExchangeEnd CurlExchange::endFor(int result) const {
     if (result == CURLE_OK) return {};
     // libcurl takes a line that is longer than it likes (100 KiB) for a lack of memory.
     if (mHeadIsTooLong || (result == CURLE_OUT_OF_MEMORY && !mHeadIsWhole)) {
-        Foundation::gWarn.log("<%@>: more than %zu bytes of headers, or too many in one",
-                              mMessage->getURL(), ConnectionLimits::kMaxHeaderBytes);
+        Foundation::gWarn.log("<%s>: more than %zu bytes of headers, or too many in one",
+                              mMessage->getPlace(), ConnectionLimits::kMaxHeaderBytes);
         return {NetError(NetError::kPFURL, OVURLErrorBadServerResponse), nullptr};
     }
     long osError = 0;

@@ -40,6 +40,12 @@ Returner<HTTPMessage> HTTPMessage::request(String* method, URL* url) {
     return Returner<HTTPMessage>(message);
 }
 
+std::string HTTPMessage::getPlace() const {
+    const Foundation::Ref<URL> plain = mURL->getURLWithoutUser();
+    const Foundation::Ref<String> text = plain->getAbsoluteString();
+    return text->utf8();
+}
+
 Returner<HTTPMessage> HTTPMessage::response(int status, std::vector<HTTPHeader> headers) {
     auto* message = new HTTPMessage;
     message->mStatus = status;

@@ -35,6 +35,8 @@ class HTTPMessage : public Foundation::PFRefCounted {
     /// Null for a response.
     Foundation::URL* getURL() const { return mURL; }
     void setURL(Foundation::URL* url) { mURL = url; }
+    /// The URL of a request as text for the log, without user and password.
+    std::string getPlace() const;
     /// The status of a response; 0 for a request.
     int getStatus() const { return mStatus; }
 

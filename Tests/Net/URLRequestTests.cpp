@@ -255,6 +255,34 @@ TEST_F(URLRequestTest, LetsALoopThatWasBusyReadFirst) {
     EXPECT_EQ(mRecorder->notes.back(), "finished");
 }
 
+TEST_F(URLRequestTest, GivesTheNextServerItsWholeTime) {
+    begin("http://a/");
+    network().pending()[0]->sendHead(302, {{"Location", "http://b/"}});
+    // The body of the redirect never ends: it is given up, and the next server asked.
+    mClock.advanceBy(121);
+    ASSERT_EQ(network().asked().size(), 2u);
+    mClock.advanceBy(118);
+    EXPECT_EQ(mRecorder->notes, Notes{"opened"});
+    mClock.advanceBy(3);
+    EXPECT_EQ(mRecorder->notes.back(), "failed 15 -1001");
+    // Even if it answers right when the time is over.
+    begin("http://a/");
+    network().pending()[0]->sendHead(302, {{"Location", "http://b/"}});
+    mClock.advanceBy(121);
+    mClock.jumpTo(mClock.now() + 120);
+    network().pending()[0]->answer({.body = "late"});
+    turn();
+    EXPECT_EQ(mRecorder->notes.back(), "finished");
+}
+
+TEST_F(URLRequestTest, WritesNoPasswordIntoWarnings) {
+    const Support::LogCapture log;
+    begin("http://ann:secret@a/");
+    mClock.advanceBy(121);
+    EXPECT_EQ(log.count("<http://a/>: no byte in 120 seconds"), 1);
+    EXPECT_FALSE(log.contains("secret"));
+}
+
 TEST_F(URLRequestTest, GivesUpADocumentAfter300Seconds) {
     begin("http://a/");
     network().pending()[0]->sendHead(200);
