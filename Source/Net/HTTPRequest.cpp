@@ -27,7 +27,7 @@ bool isPermanent(int status) {
 HTTPRequest::HTTPRequest(URL* url, String* method) : URLRequest(url), mMethod(method) {
     OV_ASSERT(method);
     const Ref<String> name = String::string("User-Agent");
-    setHeader(name, userAgent());
+    putHeader(*HTTPRequest::_getRequest(), name, userAgent());
     gLogHTTP.log("Init HTTPRequest %p to %@ <%@>", static_cast<const void*>(this), mMethod, mURL);
 }
 
@@ -53,10 +53,13 @@ ConnectionRequest* HTTPRequest::_getRequest() {
 
 void HTTPRequest::setHeader(String* header, String* value) {
     OV_ASSERT(header);
-    if (!value) return;
+    if (value) putHeader(*_getRequest(), header, value);
+}
+
+void HTTPRequest::putHeader(ConnectionRequest& request, String* header, String* value) const {
     gLogHTTP.log("HTTPRequest %p: Set header: %@: %@", static_cast<const void*>(this), header,
                  value);
-    _getRequest()->setHeader(header, value);
+    request.setHeader(header, value);
 }
 
 Foundation::StringReturner HTTPRequest::getHeader(String* header) const {

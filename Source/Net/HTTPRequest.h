@@ -40,6 +40,8 @@ class HTTPRequest : public URLRequest {
 
  private:
     static Foundation::String* userAgent();
+    void putHeader(ConnectionRequest& request, Foundation::String* header,
+                   Foundation::String* value) const;
     void noteRedirect(Foundation::URL* target, int status);
 
     Foundation::Ref<Foundation::String> mMethod;
