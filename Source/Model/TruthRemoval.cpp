@@ -28,10 +28,12 @@ namespace {
 
 constexpr std::string_view kMark = ".deleted.at.";
 
+/// Whether a feed is stored and has saved entries: in the file, or still to be read from theirs.
 bool hasArchivedEntries(const std::string& feedIdentifier) {
     return SQLite::gDatabase->execScalar(
-               "select exists(select 1 from Feeds as f, Entries as e where f.identifier=%Q and "
-               "e.feed=f.rowID and not e.current)",
+               "select exists(select 1 from Feeds as f where f.identifier=%Q and "
+               "(f.recoverOldEntries or exists(select 1 from Entries as e where e.feed=f.rowID and "
+               "not e.current)))",
                feedIdentifier.c_str()) != 0;
 }
 

@@ -133,6 +133,16 @@ TEST_F(TruthDirectoryTest, KeepsItsFilesUntilTheDeletionOfItsFeedIsCommitted) {
     waitUntilDeleted();
 }
 
+TEST_F(TruthDirectoryTest, ComesBackWhereItsEntriesWaitToBeRead) {
+    makeFeed("abc", true);
+    ministry().openDatabase();
+    db().execute("update Feeds set recoverOldEntries=1");
+    db().close(true);
+    writeFile("Feeds/abc.deleted.at.5.000000/1.xml", "<item/>");
+    ministry().openDatabase();
+    EXPECT_EQ(readFile("Feeds/abc/1.xml"), "<item/>");
+}
+
 TEST_F(TruthDirectoryTest, ComesBackWhereTheDeletionOfItsFeedFails) {
     makeFeed("abc", false);
     writeFile("Feeds/abc/1.xml", "<item/>");
