@@ -2,13 +2,42 @@
 
 #include <gtest/gtest.h>
 
+#include <csignal>
 #include <cstdlib>
+#include <fstream>
+#include <string>
 
 namespace {
+
+namespace fs = std::filesystem;
 
 /// What CTest is told to take for "skipped". A suite in which one case was skipped counts as
 /// skipped, so that none goes unseen; one with a failure never does.
 constexpr int kSkipped = 77;
+
+/// The words of a process's command, with a 0 behind each; empty for one that has ended.
+std::string commandOf(const fs::path& process) {
+    std::ifstream file(process / "cmdline");
+    std::string command;
+    std::getline(file, command);
+    return command;
+}
+
+/// Ends the message bus that a program starts for the user where it finds none: it goes on when the
+/// program ends, as it must, and would serve a folder that is gone.
+void endBusOf(const fs::path& home) {
+    const fs::path bus = home / "XDG_RUNTIME_DIR/Orvane/bus";
+    if (!fs::exists(bus)) return;
+    const std::string place = "unix:path=" + bus.string();
+    for (const fs::directory_entry& process : fs::directory_iterator("/proc")) {
+        const int pid = std::atoi(process.path().filename().c_str());
+        if (pid <= 1) continue;
+        const std::string command = commandOf(process.path());
+        if (command.starts_with("dbus-daemon") && command.find(place) != std::string::npos) {
+            kill(pid, SIGTERM);
+        }
+    }
+}
 
 }  // namespace
 
@@ -30,6 +59,7 @@ int main(int argc, char** argv) {
     setenv("LC_ALL", "C", 1);
     setenv("GSETTINGS_BACKEND", "memory", 1);
     const int result = RUN_ALL_TESTS();
+    endBusOf(home.path());
     const bool skippedAny = testing::UnitTest::GetInstance()->skipped_test_count() > 0;
     return result == 0 && skippedAny ? kSkipped : result;
 }
