@@ -196,6 +196,7 @@ INSTANTIATE_TEST_SUITE_P(Events, EventQueueRefuses,
                                          BadEvent{"Filter", 0, -9, EINVAL}),
                          [](const auto& each) { return each.param.name; });
 
+#ifndef __SANITIZE_ADDRESS__  // the sanitizers open files of their own
 TEST(EventQueue, SaysIfThereCanBeNone) {
     rlimit limit = {};
     getrlimit(RLIMIT_NOFILE, &limit);
@@ -210,5 +211,6 @@ TEST(EventQueue, SaysIfThereCanBeNone) {
     setrlimit(RLIMIT_NOFILE, &limit);
     EXPECT_EQ(what, "Couldn't create kqueue");
 }
+#endif
 
 }  // namespace

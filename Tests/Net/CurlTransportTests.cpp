@@ -5,6 +5,7 @@
 #include "NetTest.h"
 #include "Support/Coded.h"
 #include "Support/EnvVar.h"
+#include "Support/ProcessMemory.h"
 #include "Support/ScriptedServer.h"
 #include "Support/TurnUntil.h"
 #include "Support/WebServer.h"
@@ -14,7 +15,6 @@
 #include <sys/socket.h>
 
 #include <algorithm>
-#include <fstream>
 #include <optional>
 
 using namespace Orvane;
@@ -74,26 +74,18 @@ class CurlTransportTest : public testing::Test {
     std::string body() const {
         return std::string(Foundation::Data::asBytes(mRequest->getResponseData()).view());
     }
-    /// The memory that the process has ("VmRSS:"), or the most it has had ("VmHWM:"), in bytes.
-    static std::size_t memory(const char* which) {
-        std::ifstream file("/proc/self/status");
-        for (std::string word; file >> word;) {
-            std::size_t kilobytes = 0;
-            if (word == which && file >> kilobytes) return kilobytes * 1024;
-        }
-        return 0;
-    }
     /// Fetches what ends in an error, and looks at what that costs.
     void fetchWithinMemory(const std::string& address) {
-        const std::size_t before = memory("VmRSS:");
+        const std::size_t before = Support::ProcessMemory::now();
+        Support::ProcessMemory::forgetPeak();
         EXPECT_EQ(fetch(address), "failed 15 -1011");
-        EXPECT_LT(memory("VmHWM:"), before + 160 * kMiB);
+        EXPECT_LT(Support::ProcessMemory::peak(), before + 160 * kMiB);
         {
             const Foundation::AutoreleasePool pool;
             mRequest = nullptr;
         }
         Foundation::RunLoop::current().turn();
-        EXPECT_LT(memory("VmRSS:"), before + 16 * kMiB);
+        EXPECT_LT(Support::ProcessMemory::now(), before + 16 * kMiB);
     }
 
     /// The flags of the descriptors of this process that are connected to the server.

@@ -4,7 +4,8 @@
 
 namespace Support {
 
-/// The memory of this process that is in use, in bytes.
+/// The memory of this process that is in use, in bytes. 0 under the address sanitizer, which keeps
+/// what is freed for a while.
 struct ProcessMemory {
     static std::size_t now();
     /// The most that was in use since `forgetPeak`.
