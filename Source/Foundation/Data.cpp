@@ -7,14 +7,27 @@
 #include "Foundation/String.h"
 
 #include <glib.h>
+#include <openssl/evp.h>
+
 #include <functional>
-#include <memory>
+#include <span>
 
 namespace Foundation {
 
 namespace {
 
 constexpr std::size_t kLengthInLogs = 32;
+
+std::string hexadecimal(std::span<const unsigned char> bytes) {
+    static constexpr const char* kDigits = "0123456789abcdef";
+    std::string text;
+    text.reserve(2 * bytes.size());
+    for (const unsigned char byte : bytes) {
+        text += kDigits[byte >> 4];
+        text += kDigits[byte & 15];
+    }
+    return text;
+}
 
 }  // namespace
 
@@ -60,11 +73,14 @@ StringReturner Data::base64String() const {
 }
 
 StringReturner Data::SHA1HashString() const {
-    const std::unique_ptr<char, void (*)(void*)> digits(
-        g_compute_checksum_for_data(G_CHECKSUM_SHA1, reinterpret_cast<const guchar*>(view().data()),
-                                    getLength()),
-        g_free);
-    return String::string(std::string(digits.get()));
+    // GLib has it too, but takes three times as long for it where the processor knows SHA-1.
+    static const EVP_MD* const sAlgorithm = EVP_MD_fetch(nullptr, "SHA1", nullptr);
+    unsigned char digest[EVP_MAX_MD_SIZE];
+    unsigned length = 0;
+    OV_ASSERT_MESSAGE(sAlgorithm && EVP_Digest(getBytes(), getLength(), digest, &length, sAlgorithm,
+                                               nullptr) == 1,
+                      "SHA-1 of %zu bytes", getLength());
+    return String::string(hexadecimal({digest, length}));
 }
 
 std::size_t Data::getHash() const {
