@@ -22,6 +22,13 @@ double secondsUntil(const Date* date) {
     return date ? -date->getTimeAgo() : FeedCore::kRefreshNever;
 }
 
+/// Whether a feed that is due soon had its turn too short a time ago. The end of its refresh starts
+/// the next pass, which would start it again for ever.
+bool wasJustRefreshed(const FeedCore& feed, double secondsUntilDue) {
+    const double ago = feed.getRefreshInterval() - secondsUntilDue;
+    return secondsUntilDue > 0 && ago < FeedCore::sMinimumRefreshInterval;
+}
+
 }  // namespace
 
 void RefreshPass::run() {
@@ -47,7 +54,7 @@ void RefreshPass::visit(FeedCore& feed) {
                              seconds, feed.getRefreshInterval());
     }
     if (!next.get()) return;
-    if (seconds <= mNowSeconds) {
+    if (seconds <= mNowSeconds && !wasJustRefreshed(feed, seconds)) {
         feed.refresh(false, true);
     } else if (!mEarliest.get() || next->compare(*mEarliest) < 0) {
         mEarliest = next;

@@ -13,7 +13,8 @@ class FeedCore;
 /// looks again.
 class RefreshPass : Foundation::Uncopyable {
  public:
-    /// What is due within `nowSeconds` is due.
+    /// What is due within `nowSeconds` is due, unless it was refreshed less than
+    /// `FeedCore::sMinimumRefreshInterval` ago.
     explicit RefreshPass(double nowSeconds) : mNowSeconds(nowSeconds) {}
 
     /// Goes through the feeds in the order of their IDs. A failure that is not the database's is

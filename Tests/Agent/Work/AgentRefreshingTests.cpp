@@ -159,6 +159,22 @@ TEST_F(AgentRefreshingTest, TakesWhatIsDueWithin120SecondsForDue) {
     EXPECT_NEAR(remaining(), 120.1, 1e-3);
 }
 
+TEST_F(AgentRefreshingTest, NeverRefreshesAFeedTwiceWithinAMinute) {
+    feed("a", 60, 60);
+    feed("b", 60, 150);
+    EXPECT_THAT(pass(), ElementsAre("a", "b"));
+    feeders.refreshed.clear();
+    feeders.finish("http://e.org/a");
+    feeders.finish("http://e.org/b");
+    EXPECT_THAT(feeders.refreshed, IsEmpty());
+    EXPECT_NEAR(remaining(), 60, 1e-3);
+    // The pass for the one finds that the other is due within 120 seconds.
+    clock.advanceBy(59.9);
+    EXPECT_THAT(feeders.refreshed, IsEmpty());
+    clock.advanceBy(0.1);
+    EXPECT_THAT(feeders.refreshed, ElementsAre("a", "b"));
+}
+
 TEST_F(AgentRefreshingTest, LooksAgainWhenTheFirstOfTheOthersIsDue) {
     feed("late", 0, 5000);
     feed("soon", 0, 3000);

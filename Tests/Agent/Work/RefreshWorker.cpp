@@ -2,7 +2,7 @@
 //
 //   refresh_worker BASE    works on a storage as the agent does, without a message bus and without
 //                          the wait at the start. Writes "started", and "ended URL" when the
-//                          refresh of a feed has ended well.
+//                          refresh of a feed has ended well, "failed URL" when it has not.
 
 #include "Agent/AgentPorts.h"
 #include "Agent/AgentTask.h"
@@ -63,7 +63,8 @@ class Acknowledgements {
  private:
     void ended(Notification* notification) {
         const auto* feed = notification->getObject<FeedCore>();
-        if (feed->getLastError().code == 0) say("ended " + feed->mURL.getValue()->text());
+        const char* const end = feed->getLastError().code == 0 ? "ended " : "failed ";
+        say(end + feed->mURL.getValue()->text());
     }
 
     MethodReceiver<Notification, Acknowledgements> mReceiver;
