@@ -3,6 +3,7 @@
 #include <Orvane/OVBase.h>
 #include <Orvane/OVErrorCode.h>
 
+#include <map>
 #include <string>
 #include <utility>
 
@@ -29,6 +30,9 @@ class OVError {
     /// The URL that could not be loaded.
     const std::string& URL() const { return mURL; }
     void setURL(std::string url) { mURL = std::move(url); }
+    /// Numbers that tell more, by keys which the domain explains.
+    const std::map<std::string, int>& userInfo() const { return mUserInfo; }
+    void setUserInfo(std::map<std::string, int> info) { mUserInfo = std::move(info); }
 
     bool operator==(const OVError&) const = default;
 
@@ -42,6 +46,7 @@ class OVError {
     std::string mFailureReason;
     std::string mRecoverySuggestion;
     std::string mURL;
+    std::map<std::string, int> mUserInfo;
 };
 
 /// Makes errors arguments of `%@`.

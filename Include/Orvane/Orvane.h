@@ -18,6 +18,10 @@
 #include <Orvane/OVFeedURLUtils.h>
 #include <Orvane/OVFormat.h>
 #include <Orvane/OVLink.h>
+#include <Orvane/OVListAdditions.h>
 #include <Orvane/OVLog.h>
 #include <Orvane/OVNotificationCenter.h>
+#include <Orvane/OVRegularExpression.h>
+#include <Orvane/OVUtils.h>
+#include <Orvane/OVXMLAdditions.h>
 #include <Orvane/OVXMLElement.h>

@@ -40,6 +40,7 @@ constexpr Text kTexts[] = {
     {"OVNotAFeedErrorRecoverySuggestion", "Look for a link to a feed on the site's pages."},
     {"PNURLErrorUserAuthenticationRequired Description",
      "The server wants a user name and a password."},
+    {"Regular expression syntax error", "Regular expression syntax error"},
 
     {"kUntitledFileName", "Untitled"},
 };
