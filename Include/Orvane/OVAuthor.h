@@ -14,7 +14,7 @@ class OVAuthorInternal;
 /// Getters throw `OVException` if the database cannot be read. Thread: see `OVObject`.
 class OV_EXPORT OVAuthor : public OVObject {
  public:
-    using Text = std::optional<std::string>;
+    using Text = std::optional<std::string>;  ///< none for what there is not
 
     /// An author of the application's own, who is in no database. Throws `OVException` if all three
     /// are missing, and for a `URL` that is none.
@@ -26,8 +26,11 @@ class OV_EXPORT OVAuthor : public OVObject {
 
     ~OVAuthor() override;
 
+    /// Plain text.
     Text name() const;
+    /// An address of mail, as the feed has it.
     Text email() const;
+    /// That of the person's page, absolute.
     Text URL() const;
     /// The first of these that is not empty; none if all are.
     Text nameForDisplay() const;
@@ -46,6 +49,7 @@ class OV_EXPORT OVAuthor : public OVObject {
     /// one then. Throws `OVException` if the agent cannot do that.
     void _addToDatabase();
 
+    /// 'OVAuthor["name" row]', with the row's ID. Throws as getters of values.
     std::string description() const override;
     bool isEqual(const OVObject* other) const override;
     std::size_t hash() const override;

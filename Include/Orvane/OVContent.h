@@ -14,13 +14,15 @@ class OVContentInternal;
 /// Getters throw `OVException` if the database cannot be read. Thread: see `OVObject`.
 class OV_EXPORT OVContent : public OVObject {
  public:
-    using Text = std::optional<std::string>;
+    using Text = std::optional<std::string>;  ///< none for what there is not
 
-    /// A content of the application's own, which is in no database. Throws `OVException` without a
+    /// A content of the application's own, which is in no database. The bytes are copied. Throws
+    /// `OVException` without data, which is a view of nothing and not one of 0 bytes, and without a
     /// type.
     static std::shared_ptr<OVContent> create(std::string_view data, const std::string& MIMEType);
-    /// The same of plain text and of HTML, both in UTF-8. Throws `OVException` for what is not.
+    /// The same of plain text in UTF-8. Throws `OVException` for what is not.
     static std::shared_ptr<OVContent> createFromText(const std::string& text);
+    /// The same of HTML in UTF-8. Throws as above.
     static std::shared_ptr<OVContent> createFromHTML(const std::string& html);
 
     ~OVContent() override;
@@ -36,6 +38,7 @@ class OV_EXPORT OVContent : public OVObject {
     /// The text as HTML; none for what is neither plain text nor HTML.
     Text HTMLString() const;
 
+    /// "OVContent[type, n bytes]". Throws as getters of values.
     std::string description() const override;
     bool isEqual(const OVObject* other) const override;
     std::size_t hash() const override;

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <Orvane/OVBase.h>
+#include <Orvane/OVLink.h>
 
 #include <chrono>
 #include <optional>
@@ -25,16 +26,7 @@ struct OVDocument {
         Tidied,    ///< as they are shown: repaired, and safe; none where that fails
     };
     /// What a link leads to.
-    enum class LinkKind {
-        Nothing = 0,
-        RSSFeed = 1,
-        AtomFeed = 2,
-        AtomService = 3,
-        FOAFDocument = 4,
-        RSDDocument = 5,
-        Self = 6,
-        AlternatePage = 7,
-    };
+    using LinkKind = OVLink::Kind;
 
     struct Author {
         Text name, email, url;

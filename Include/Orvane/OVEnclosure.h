@@ -17,7 +17,7 @@ class OVEntry;
 /// see `OVObject`.
 class OV_EXPORT OVEnclosure : public OVObject {
  public:
-    using Text = std::optional<std::string>;
+    using Text = std::optional<std::string>;  ///< none for what there is not
 
     /// The states of a download.
     enum DownloadState : int {
@@ -41,12 +41,16 @@ class OV_EXPORT OVEnclosure : public OVObject {
     static std::shared_ptr<OVEnclosure> createFromData(std::string_view data, const Text& MIMEType,
                                                        const Text& name, const Text& extension);
 
+    /// The download goes on.
     ~OVEnclosure() override;
 
     /// The entry that it is attached to. Null if there is none, and if that cannot be read.
     std::shared_ptr<OVEntry> entry() const;
+    /// Where the file is to be had, absolute.
     Text URL() const;
+    /// The media type, as the feed says.
     Text MIMEType() const;
+    /// Plain text.
     Text title() const;
     /// In bytes, as the feed says; 0 if it says nothing.
     long long length() const;
@@ -68,6 +72,7 @@ class OV_EXPORT OVEnclosure : public OVObject {
     /// Deletes the file, or what there is of it. A failure is reported in the log.
     void deleteDownload();
 
+    /// "OVEnclosure[<URL> row]", with the row's ID. Throws as getters of values.
     std::string description() const override;
     bool isEqual(const OVObject* other) const override;
     std::size_t hash() const override;

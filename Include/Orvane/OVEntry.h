@@ -21,10 +21,11 @@ class OVFeed;
 /// report that in the log instead, and give null or an empty list. Thread: see `OVObject`.
 class OV_EXPORT OVEntry : public OVObject {
  public:
-    using Text = std::optional<std::string>;
-    using Time = std::optional<OVDate>;
+    using Text = std::optional<std::string>;  ///< none for what there is not
+    using Time = std::optional<OVDate>;       ///< none for what is not known
     using List = std::vector<std::shared_ptr<OVEntry>>;
 
+    /// The entry stays in the database.
     ~OVEntry() override;
 
     // Identity and place.
@@ -39,23 +40,35 @@ class OV_EXPORT OVEntry : public OVObject {
 
     // What the feed says.
 
+    /// Plain text.
     Text title() const;
+    /// Who may do what with it, in plain text.
     Text rights() const;
-    /// The web page.
+    /// That of the web page, absolute.
     Text alternateURL() const;
     /// What the relative URLs of the entry count from.
     Text baseURL() const;
-    // Times of zones are names such as "Europe/Berlin" or "GMT+02:00".
+    /// When its author began it.
     Time dateCreated() const;
+    /// The zone of that date, such as "Europe/Berlin" or "GMT+02:00".
     Text timeZoneCreated() const;
+    /// When it was first to be seen by all.
     Time datePublished() const;
+    /// The zone of that date, as above.
     Text timeZonePublished() const;
+    /// When it last changed, by its own account.
     Time dateUpdated() const;
+    /// The zone of that date, as above.
     Text timeZoneUpdated() const;
+    /// All of its text; null if the feed has not got that.
     std::shared_ptr<OVContent> content() const;
+    /// What it is about; null if the feed does not say.
     std::shared_ptr<OVContent> summary() const;
+    /// Who wrote it.
     std::vector<std::shared_ptr<OVAuthor>> authors() const;
+    /// Who helped.
     std::vector<std::shared_ptr<OVAuthor>> contributors() const;
+    /// The files that it has attached.
     std::vector<std::shared_ptr<OVEnclosure>> enclosures() const;
 
     // What happened to it here.
@@ -69,7 +82,8 @@ class OV_EXPORT OVEntry : public OVObject {
 
     /// When it was published, or else updated, or else first seen.
     Time dateForDisplay() const;
-    /// The title or, without one, the beginning of its text in quotes, at most 120 characters.
+    /// The title or, without one, the beginning of its text in quotes, at most 120 characters on
+    /// one line. Empty if it has neither.
     std::string titleForDisplay() const;
     /// Its authors, with ", " in between; empty if there are none.
     std::string authorsForDisplay() const;
@@ -85,22 +99,30 @@ class OV_EXPORT OVEntry : public OVObject {
 
     /// Whether the feed's document still has it.
     bool isCurrent() const;
+    /// The same.
     bool current() const { return isCurrent(); }
+    /// Whether the user has read it.
     bool isRead() const;
+    /// The same.
     bool read() const { return isRead(); }
+    /// Whether the user has flagged it.
     bool isFlagged() const;
+    /// The same.
     bool flagged() const { return isFlagged(); }
-    // Each throws `OVException` if the agent cannot do it.
+    /// Throws `OVException` if the agent cannot do it.
     void setRead(bool read);
+    /// Throws as above.
     void setFlagged(bool flagged);
 
-    /// Sets the state of many entries by one call to the agent. A failure is reported in the log.
+    /// Sets the state of many entries by one call to the agent; null is left out. A failure is
+    /// reported in the log.
     static void setEntries(const List& entries, bool read);
     /// The same for both states; none leaves one as it is. Throws `OVException` if the agent cannot
     /// do it.
     static void setFlags(const List& entries, std::optional<bool> read,
                          std::optional<bool> flagged);
 
+    /// "OVEntry['title' row]", with the title if it has been read, and the row's ID.
     std::string description() const override;
     bool isEqual(const OVObject* other) const override;
     std::size_t hash() const override;

@@ -18,11 +18,19 @@ struct OVEntryQuery {
         Received,    ///< when the entry was first seen here: the fastest
         ForDisplay,  ///< when it was published, or else updated, or else first seen
     };
-    enum class Order { ByDate, ByTitle, ByFeed };
+    /// What entries are sorted by.
+    enum class Order {
+        ByDate,
+        ByTitle,  ///< without regard to case in ASCII
+        ByFeed,   ///< by the title of the feed, as above
+    };
 
-    /// Only of these feeds; all of the client's if there are none.
+    /// Only of these feeds; all of the client's if there are none. One that is not the client's,
+    /// and null, has no entries.
     std::vector<std::shared_ptr<OVFeed>> feeds;
+    /// Only those that the user has read, or has not.
     std::optional<bool> read;
+    /// Only those that the user has flagged, or has not.
     std::optional<bool> flagged;
     /// Only from this date on.
     std::optional<OVDate> from;
@@ -33,6 +41,7 @@ struct OVEntryQuery {
     std::vector<std::string> words;
     /// Only those in whose author's name or address this stands. Case as above.
     std::string author;
+    /// Only those that have files attached, or have none.
     std::optional<bool> hasEnclosures;
 
     /// The date that `from`, `before` and the order go by.

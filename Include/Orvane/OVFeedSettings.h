@@ -10,7 +10,7 @@
 /// A 0 for an interval or a size stands for what the client's own settings say.
 class OVFeedSettings {
  public:
-    using Types = std::optional<std::vector<std::string>>;
+    using Types = std::optional<std::vector<std::string>>;  ///< media types; none for no choice
 
     static constexpr double kDefaultRefreshInterval = 1800.0;        ///< seconds
     static constexpr double kDefaultExpirationInterval = 1209600.0;  ///< seconds: 14 days
@@ -25,6 +25,8 @@ class OVFeedSettings {
         settings.setExpirationInterval(kDefaultExpirationInterval);
         return settings;
     }
+
+    // Setters keep what they get.
 
     /// Seconds between two refreshes; below 0 for never.
     double refreshInterval() const { return mRefreshInterval; }
@@ -45,7 +47,9 @@ class OVFeedSettings {
     const Types& enclosureTypes() const { return mEnclosureTypes; }
     void setEnclosureTypes(Types types) { mEnclosureTypes = std::move(types); }
 
+    /// Equal settings of their own.
     OVFeedSettings copy() const { return *this; }
+    /// Whether all of them are equal.
     bool isEqual(const OVFeedSettings& other) const { return *this == other; }
     bool operator==(const OVFeedSettings&) const = default;
 

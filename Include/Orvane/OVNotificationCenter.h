@@ -15,15 +15,19 @@
 inline constexpr char OVFeedRefreshingNotification[] = "OVFeedRefreshing";
 /// Entries of a feed have changed. The info has lists by the four keys.
 inline constexpr char OVFeedEntriesChangedNotification[] = "OVFeedEntriesChanged";
+/// How many entries of a feed are unread has changed. The object of these three is the feed.
 inline constexpr char OVFeedUnreadCountChangedNotification[] = "OVFeedUnreadCountChanged";
 /// The state of an enclosure's download has changed. The object is the enclosure.
 inline constexpr char OVEnclosureDownloadStateDidChangeNotification[] =
     "OVEnclosureDownloadStateDidChange";
 
+/// Entries that are new.
 inline constexpr char OVFeedAddedEntriesKey[] = "AddedEntries";
-/// The list of this key is one of identifiers.
+/// The list of this key is one of identifiers: of entries that are gone, or have expired.
 inline constexpr char OVFeedRemovedEntriesKey[] = "RemovedEntries";
+/// Entries whose content has changed.
 inline constexpr char OVFeedUpdatedEntriesKey[] = "UpdatedEntries";
+/// Entries that were marked as read or flagged, or as neither.
 inline constexpr char OVFeedDidChangeEntryFlagsKey[] = "OVFeedDidChangeEntryFlagsKey";
 
 /// What is announced.

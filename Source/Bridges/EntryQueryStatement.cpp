@@ -59,7 +59,8 @@ void EntryQueryStatement::chooseFeeds() {
     if (mQuery.feeds.empty()) return;
     std::string list = "[";
     for (const std::shared_ptr<OVFeed>& feed : mQuery.feeds) {
-        const SubscriptionCore* subscription = feed->_internal()._subscriptionCore();
+        const SubscriptionCore* subscription =
+            feed ? feed->_internal()._subscriptionCore() : nullptr;
         if (!subscription) continue;
         if (list.size() > 1) list += ',';
         list += std::to_string(subscription->getRowID());

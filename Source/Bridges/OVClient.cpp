@@ -3,7 +3,6 @@
 #include "Bridges/Barriers.h"
 #include "Bridges/FeedSettings.h"
 #include "Bridges/OVClientInternal.h"
-#include "Bridges/OVFeedInternal.h"
 #include "Bridges/PublicObjectFactory.h"
 #include "Bridges/PublicSession.h"
 #include "Bridges/PublicValues.h"
@@ -65,6 +64,12 @@ std::shared_ptr<OVClient> OVClient::applicationClient(std::optional<OVError>* er
     if (cached && !cached->mInternal->isLost()) return cached;
     // One that a new database does not know any more is found by its identifier, like any other.
     const std::string identifier = ApplicationIdentity::getIdentifier();
+    if (identifier == ApplicationIdentity::kUnknown) {
+        gWarn.log(
+            "Call to [[PNBundle mainBundle] bundleIdentifier] resulted in nil.  Returning nil for "
+            "applicationClient.");
+        return nullptr;
+    }
     cached = clientForBundleIdentifier(identifier, error);
     return cached;
 }

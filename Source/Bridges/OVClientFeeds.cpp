@@ -6,14 +6,13 @@
 #include "Bridges/OVFeedInternal.h"
 #include "Bridges/PublicObjectFactory.h"
 #include "Bridges/PublicValues.h"
+#include "Bridges/RowBatches.h"
 #include "Model/AgentLink.h"
 #include "Model/EnclosureCore.h"
 #include "Model/EntryCore.h"
 #include "Model/SubscriptionCore.h"
 
 #include <Orvane/OVClient.h>
-
-#include <algorithm>
 
 using namespace Foundation;
 using namespace Orvane;
@@ -22,14 +21,10 @@ using namespace Orvane;
 
 namespace {
 
-/// A call to the agent takes no more.
-constexpr std::size_t kMaxRowIDs = 100000;
-
 void refreshUnforced(const std::vector<SQLite::RowID>& feeds) {
-    for (std::size_t i = 0; i < feeds.size(); i += kMaxRowIDs) {
-        const auto count = static_cast<unsigned>(std::min(feeds.size() - i, kMaxRowIDs));
-        AgentLink::current().refreshMultiple(feeds.data() + i, count, false);
-    }
+    inBatches(feeds, [](const SQLite::RowID* rowIDs, unsigned count) {
+        AgentLink::current().refreshMultiple(rowIDs, count, false);
+    });
 }
 
 std::vector<SQLite::RowID> feedsOf(const ClientCore& client) {
@@ -120,6 +115,7 @@ void OVClient::refreshFeeds(const std::vector<std::shared_ptr<OVFeed>>& feeds) {
     changing("refreshFeeds", [&] {
         std::vector<SQLite::RowID> ids;
         for (const std::shared_ptr<OVFeed>& feed : feeds) {
+            if (!feed) continue;
             if (feed->_internal()._subscriptionCore()) {
                 ids.push_back(feed->_internal().core().getRowID());
             } else {

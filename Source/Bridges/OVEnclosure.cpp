@@ -75,7 +75,7 @@ std::shared_ptr<OVEnclosure> OVEnclosure::createFromData(std::string_view, const
 std::shared_ptr<OVEntry> OVEnclosure::entry() const {
     return reporting("-[OVEnclosure entry]", [&] {
         std::shared_ptr<OVEntry> entry = publicObject<OVEntry>(mInternal->core().getEntry());
-        if (entry) entry->_internal()._setClient(mInternal->client);
+        if (entry && mInternal->client) entry->_internal()._setClient(mInternal->client);
         return entry;
     });
 }

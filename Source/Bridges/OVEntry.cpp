@@ -6,6 +6,7 @@
 #include "Bridges/OVXMLElementTree.h"
 #include "Bridges/PublicObjectFactory.h"
 #include "Bridges/PublicValues.h"
+#include "Bridges/RowBatches.h"
 #include "Foundation/MutableString.h"
 #include "Model/AgentLink.h"
 #include "Model/AuthorCore.h"
@@ -21,9 +22,6 @@ using namespace Foundation;
 using namespace Orvane;
 
 namespace {
-
-/// A call to the agent takes no more.
-constexpr std::size_t kMaxRowIDs = 100000;
 
 constexpr std::size_t kMaxTitleLength = 120;
 
@@ -58,6 +56,7 @@ std::vector<std::shared_ptr<T>> publicObjects(Rows rows) {
 void setFlagsOf(const OVEntry::List& entries, int read, int flagged) {
     std::vector<SQLite::RowID> ids;
     for (const std::shared_ptr<OVEntry>& entry : entries) {
+        if (!entry) continue;
         EntryCore& core = entry->_internal().core();
         if (core.getRowID() == 0 || core.isChangeable()) {
             if (read >= 0) entry->setRead(read != 0);
@@ -68,10 +67,9 @@ void setFlagsOf(const OVEntry::List& entries, int read, int flagged) {
         if (read >= 0) core.mRead.unload();
         if (flagged >= 0) core.mFlagged.unload();
     }
-    for (std::size_t i = 0; i < ids.size(); i += kMaxRowIDs) {
-        const auto count = static_cast<unsigned>(std::min(ids.size() - i, kMaxRowIDs));
-        AgentLink::current().setFlags(ids.data() + i, count, read, flagged);
-    }
+    inBatches(ids, [&](const SQLite::RowID* rowIDs, unsigned count) {
+        AgentLink::current().setFlags(rowIDs, count, read, flagged);
+    });
 }
 
 int stateOf(std::optional<bool> state) {
@@ -181,8 +179,9 @@ std::vector<std::shared_ptr<OVAuthor>> OVEntry::contributors() const {
 std::vector<std::shared_ptr<OVEnclosure>> OVEntry::enclosures() const {
     return reporting("-[OVEntry enclosures]", [&] {
         auto all = publicObjects<OVEnclosure>(mInternal->core().getEnclosures(nullptr));
+        const std::shared_ptr<OVClient> client = mInternal->findClient();
         for (const std::shared_ptr<OVEnclosure>& each : all) {
-            if (mInternal->client) each->_internal()._setClient(mInternal->client);
+            if (client) each->_internal()._setClient(client);
         }
         return all;
     });
@@ -214,9 +213,10 @@ std::string OVEntry::titleForDisplay() const {
 std::string OVEntry::authorsForDisplay() const {
     return raising("-[OVEntry authorsForDisplay]", [&] {
         std::string names;
+        const char* separator = "";
         for (const std::shared_ptr<OVAuthor>& author : authors()) {
-            if (!names.empty()) names += ", ";
-            names += author->nameForDisplay().value_or("");
+            names += separator + author->nameForDisplay().value_or("");
+            separator = ", ";
         }
         return names;
     });

@@ -28,7 +28,8 @@ bool OVEntryInternal::hasMoved(const OVFeed& from) const {
 
 void OVEntryInternal::_setFeed(const std::shared_ptr<OVFeed>& newFeed) {
     OV_ASSERT_AS(newFeed != nullptr, "newFeed");
-    OV_ASSERT_MESSAGE_AS(!feed || feed == newFeed || hasMoved(*feed), "!feed || feed==newFeed",
+    OV_ASSERT_MESSAGE_AS(!feed || feed->isEqual(newFeed.get()) || hasMoved(*feed),
+                         "!feed || feed==newFeed",
                          "Trying to _setFeed of %@ to %@ when it's already %@", getOwner(),
                          newFeed.get(), feed.get());
     feed = newFeed;
@@ -48,6 +49,11 @@ std::shared_ptr<OVFeed> OVEntryInternal::findFeed() {
                   client.get());
     }
     return feed;
+}
+
+std::shared_ptr<OVClient> OVEntryInternal::findClient() const {
+    if (client) return client;
+    return feed ? feed->client() : nullptr;
 }
 
 Ref<Core> OVEntryInternal::findAgain() {

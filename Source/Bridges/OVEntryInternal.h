@@ -23,11 +23,14 @@ class OVEntryInternal : public OVInternal {
     Orvane::EntryCore* peek() const { return static_cast<Orvane::EntryCore*>(getCore()); }
 
     /// The feed by which it was found. Throws `AssertionFailure` for null, and if that is another
-    /// one that still has the entry.
+    /// one that still has the entry. What stands for the same feed of two clients is not another
+    /// one.
     void _setFeed(const std::shared_ptr<OVFeed>& newFeed);
     void _setClient(const std::shared_ptr<OVClient>& newClient) { client = newClient; }
     /// See `OVEntry::feed`.
     std::shared_ptr<OVFeed> findFeed();
+    /// The client through which it was found, or else that of the feed; null if neither is known.
+    std::shared_ptr<OVClient> findClient() const;
 
     std::shared_ptr<OVFeed> feed;      ///< null until it is known
     std::shared_ptr<OVClient> client;  ///< through which it was found; may be null

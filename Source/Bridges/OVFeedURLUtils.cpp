@@ -21,36 +21,47 @@ Text textOfTaken(const Ref<URL>& url) {
     return textOf(url.get());
 }
 
+/// Reports whatever fails, also what cannot be taken, and gives none or false then.
+template <class Body>
+std::invoke_result_t<Body> quietly(const char* where, Body&& body) {
+    try {
+        return reporting(where, body);
+    } catch (const ParameterException& exception) {
+        doWarnAboutException(&exception, where);
+    }
+    return {};
+}
+
 }  // namespace
 
 bool OVFeedURLUtils::_webIsFeedProtocolURL(const Text& url) {
-    return reporting("+[OVFeedURLUtils _webIsFeedProtocolURL:]",
-                     [&] { return Forms::isFeedProtocolURL(parse(url).get()); });
+    return quietly("+[OVFeedURLUtils _webIsFeedProtocolURL:]",
+                   [&] { return Forms::isFeedProtocolURL(parse(url).get()); });
 }
 
 bool OVFeedURLUtils::_webIsFeedsProtocolURL(const Text& url) {
-    return reporting("+[OVFeedURLUtils _webIsFeedsProtocolURL:]",
-                     [&] { return Forms::isFeedsProtocolURL(parse(url).get()); });
+    return quietly("+[OVFeedURLUtils _webIsFeedsProtocolURL:]",
+                   [&] { return Forms::isFeedsProtocolURL(parse(url).get()); });
 }
 
 bool OVFeedURLUtils::isKnownURL(const Text& url) {
-    return reporting("+[OVFeedURLUtils isKnownURL:]",
-                     [&] { return Forms::isKnownURL(parse(url).get()); });
+    return quietly("+[OVFeedURLUtils isKnownURL:]",
+                   [&] { return Forms::isKnownURL(parse(url).get()); });
 }
 
 Text OVFeedURLUtils::feedURLForSourceURL(const Text& url) {
-    return reporting("+[OVFeedURLUtils feedURLForSourceURL:]",
-                     [&] { return textOfTaken(Forms::feedURLForSourceURL(parse(url).get())); });
+    return quietly("+[OVFeedURLUtils feedURLForSourceURL:]",
+                   [&] { return textOfTaken(Forms::feedURLForSourceURL(parse(url).get())); });
 }
 
 Text OVFeedURLUtils::sourceURLForFeedURL(const Text& url) {
-    return reporting("+[OVFeedURLUtils sourceURLForFeedURL:]",
-                     [&] { return textOfTaken(Forms::sourceURLForFeedURL(parse(url).get())); });
+    return quietly("+[OVFeedURLUtils sourceURLForFeedURL:]",
+                   [&] { return textOfTaken(Forms::sourceURLForFeedURL(parse(url).get())); });
 }
 
 Text OVFeedURLUtils::aggregateFeedURLForURLs(const std::vector<std::string>& urls, const Text& name,
                                              const Text& uuid, const Text& filter) {
-    return reporting("+[OVFeedURLUtils aggregateFeedURLForURLs:name:uuid:filter:]", [&]() -> Text {
+    return quietly("+[OVFeedURLUtils aggregateFeedURLForURLs:name:uuid:filter:]", [&]() -> Text {
         if (urls.empty()) return std::nullopt;
         const Ref<MutableArrayOf<URL>> list = MutableArrayOf<URL>::array();
         for (const std::string& url : urls) {
@@ -62,7 +73,7 @@ Text OVFeedURLUtils::aggregateFeedURLForURLs(const std::vector<std::string>& url
 }
 
 std::optional<OVFeedURLUtils::Aggregate> OVFeedURLUtils::parseAggregateFeedURL(const Text& url) {
-    return reporting(
+    return quietly(
         "+[OVFeedURLUtils parseAggregateFeedURL:name:uuid:filter:]",
         [&]() -> std::optional<Aggregate> {
             Ref<String> name, uuid, filter;
@@ -79,8 +90,8 @@ std::optional<OVFeedURLUtils::Aggregate> OVFeedURLUtils::parseAggregateFeedURL(c
 }
 
 Text OVFeedURLUtils::unfilteredAggregateURL(const Text& url) {
-    return reporting("+[OVFeedURLUtils unfilteredAggregateURL:]",
-                     [&] { return textOfTaken(Forms::unfilteredAggregateURL(parse(url).get())); });
+    return quietly("+[OVFeedURLUtils unfilteredAggregateURL:]",
+                   [&] { return textOfTaken(Forms::unfilteredAggregateURL(parse(url).get())); });
 }
 
 std::string OVFeedURLUtils::unfilteredAggregateURLString(const std::string& text) {

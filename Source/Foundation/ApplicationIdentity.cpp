@@ -55,7 +55,7 @@ std::string determine() {
         const std::string found = source();
         if (!found.empty()) return validUTF8(found);
     }
-    return "unknown";
+    return ApplicationIdentity::kUnknown;
 }
 
 /// Empty as long as nothing has asked.

@@ -15,7 +15,10 @@ namespace Foundation {
 ///
 /// Any thread.
 struct ApplicationIdentity {
-    /// Never empty, and valid UTF-8.
+    /// What stands for none.
+    static constexpr const char* kUnknown = "unknown";
+
+    /// Never empty, and valid UTF-8; `kUnknown` if there is none of the above.
     static std::string getIdentifier();
     /// For programs that know better, before anything asks. Throws `AssertionFailure` if another
     /// identifier is in use already, or for one that is empty or not UTF-8.

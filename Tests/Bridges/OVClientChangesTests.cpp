@@ -265,3 +265,82 @@ TEST_F(OVClientChangesTest, HearsNothingOnceItIsGone) {
     EXPECT_EQ(take(), Strings());
     client = me();
 }
+
+TEST_F(OVClientChangesTest, LogsWhatItHearsAndTells) {
+    const Support::LoggingOn logging({&gLog, &gLogAPI});
+    const auto says = [&](const std::string& text) {
+        return log.contains("OVClient[org.example.Me]" + text);
+    };
+    later();
+    addEntryNow("e1");
+    announce();
+    EXPECT_TRUE(says(" notified of updated entries!"));
+    EXPECT_TRUE(says(" sendChangesSinceDate: "));
+    EXPECT_TRUE(log.contains("    found OVEntry["));
+    EXPECT_TRUE(log.contains("...end sendChangesSinceDate -- new dateLastUpdated = "));
+    write("update Subscriptions set unreadCount=1 where feed!=0");
+    announce();
+    EXPECT_TRUE(says(" checking subscriptions for changes"));
+    client->setTracksEntryChanges(false);
+    addEntryNow("e2");
+    announce();
+    EXPECT_TRUE(says(" ignoring entry updates (tracksEntryChanges is off)"));
+    const std::string feed = client->feedWithURL(kAddress)->description();
+    deliver("com.tarnwick.orvane.FeedBeganUpdate", std::to_string(feedID));
+    EXPECT_TRUE(says(" notified: com.tarnwick.orvane.FeedBeganUpdate"));
+    EXPECT_TRUE(says(": " + feed + " began refresh"));
+    deliver("com.tarnwick.orvane.FeedEndedUpdate", std::to_string(feedID));
+    EXPECT_TRUE(says(": " + feed + " ended refresh"));
+    later(4);
+    EXPECT_TRUE(says(": refreshNonBackgroundSubscriptions"));
+}
+
+TEST_F(OVClientChangesTest, LogsHowADownloadGoes) {
+    write(
+        OVFormat("insert into Enclosures (entry,url,length,downloadState) values "
+                 "(%lli,'http://e.org/file',100,2)",
+                 addEntry(feedID, "e1")));
+    const Support::LoggingOn logging({&gLog, &gLogAPI});
+    deliver("com.tarnwick.orvane.EnclosureDownloadProgress", OVFormat("%lli,1,40", feedID));
+    EXPECT_TRUE(
+        log.contains("OVEnclosure[<http://e.org/file> 1]: download status changed (state=2, "
+                     "bytes=40, progress=0.000)"));
+}
+
+TEST_F(OVClientChangesTest, TakesProgressWithoutReading) {
+    write(
+        OVFormat("insert into Enclosures (entry,url,length,downloadState) values "
+                 "(%lli,'http://e.org/file',100,2)",
+                 addEntry(feedID, "e1")));
+    const std::shared_ptr<OVEnclosure> enclosure = client->enclosures().at(0);
+    EXPECT_EQ(enclosure->downloadState(), OVEnclosure::Downloading);
+    const Support::LoggingOn logging({&gLog, &gLogDownload, &SQLite::gLogSQL});
+    log.clear();
+    deliver("com.tarnwick.orvane.EnclosureDownloadProgress", OVFormat("%lli,1,40", feedID));
+    EXPECT_TRUE(log.contains("Notified of 40 downloaded bytes"));
+    EXPECT_FALSE(log.contains("Enclosures"));
+}
+
+TEST_F(OVClientChangesTest, ReportsWhatFailsAsItHears) {
+    db().close(false);
+    deliver("com.tarnwick.orvane.FeedBeganUpdate", std::to_string(feedID));
+    EXPECT_TRUE(log.contains("OVClient: Exception handling feed/encl change: "));
+    EXPECT_EQ(take(), Strings());
+}
+
+TEST_F(OVClientChangesTest, TellsTwoClientsOfOneEntry) {
+    const std::shared_ptr<OVClient> other =
+        OVClient::clientForBundleIdentifier("org.example.Other");
+    agent->addSubscription(other->_internal().core().getRowID(), feedID);
+    announce();
+    RecordingDelegate theirs;
+    other->setDelegate(&theirs);
+    later();
+    addEntryNow("e1");
+    announce();
+    EXPECT_EQ(take(), (Strings{"begin", "added e1", "end"}));
+    EXPECT_EQ(theirs.told, (Strings{"begin", "added e1", "end"}));
+    EXPECT_EQ(delegate.lastFeed->client(), client);
+    EXPECT_EQ(theirs.lastFeed->client(), other);
+    other->setDelegate(nullptr);
+}

@@ -47,6 +47,26 @@ TEST_F(OVClientTest, TakesTheApplicationsIdentifierBeforeItsFirstUseAlone) {
     EXPECT_NE(exceptionOf([] { OVClient::setApplicationIdentifier("org.example.Else"); }), "none");
 }
 
+TEST_F(OVClientTest, IsNullIfTheApplicationHasNoIdentifier) {
+    ApplicationIdentity::_forget();
+    ApplicationIdentity::setIdentifier(ApplicationIdentity::kUnknown);
+    std::optional<OVError> error;
+    EXPECT_FALSE(OVClient::applicationClient(&error));
+    EXPECT_FALSE(error);
+    EXPECT_TRUE(agent->calls.empty());
+    EXPECT_TRUE(
+        log.contains("Call to [[PNBundle mainBundle] bundleIdentifier] resulted in nil.  Returning "
+                     "nil for applicationClient."));
+}
+
+TEST_F(OVClientTest, LogsWhichRowItIs) {
+    const Support::LoggingOn logging({&gLog, &gLogAPIVerbose});
+    const std::shared_ptr<OVClient> client = OVClient::applicationClient();
+    EXPECT_TRUE(
+        log.contains(OVFormat("+clientForBundleIdentifier = %@", client->_internal().peek())));
+    EXPECT_TRUE(log.contains("INIT OVClient[org.example.Me]"));
+}
+
 TEST_F(OVClientTest, OfAnotherApplicationIsNotGivenIfItIsPrivate) {
     EXPECT_TRUE(OVClient::clientForBundleIdentifier("org.example.Open"));
     EXPECT_TRUE(OVClient::clientForBundleIdentifier("org.example.Closed"));

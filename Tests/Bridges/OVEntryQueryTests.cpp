@@ -226,6 +226,53 @@ TEST_F(OVEntryQueryTest, ChoosesAmongRowIDsOfAnIndex) {
         << unread;
 }
 
+TEST_F(OVEntryQueryTest, ReadsNoTableFromEndToEndWhateverItAsks) {
+    OVEntryQuery all;
+    all.feeds = {feedOf("http://e.org/1"), nullptr};
+    all.read = false;
+    all.flagged = true;
+    all.from = OVDate(1);
+    all.before = OVDate(2);
+    all.words = {"a", "b"};
+    all.author = "c";
+    all.hasEnclosures = true;
+    for (const auto order :
+         {OVEntryQuery::Order::ByDate, OVEntryQuery::Order::ByTitle, OVEntryQuery::Order::ByFeed}) {
+        for (const auto date : {OVEntryQuery::Date::Received, OVEntryQuery::Date::ForDisplay}) {
+            all.order = order;
+            all.date = date;
+            const std::string plan = planOf(all);
+            // The list of feeds is no table.
+            EXPECT_EQ(plan.find("SCAN "), plan.find("SCAN json_each")) << plan;
+            EXPECT_EQ(plan.find("SCAN ", plan.find("SCAN json_each") + 1), std::string::npos)
+                << plan;
+            EXPECT_NE(plan.find("Entries_unreadcount (feed=? AND read=?"), std::string::npos)
+                << plan;
+            EXPECT_NE(plan.find("Enclosures_entry (entry=?)"), std::string::npos) << plan;
+        }
+    }
+}
+
+TEST_F(OVEntryQueryTest, FindsTheNewestOfAHundredThousand) {
+    write(
+        OVFormat("with recursive n(i) as (select 1 union all select i+1 from n where i<100000) "
+                 "insert into Entries (feed,identifier,read,flagged,localDateCreated) "
+                 "select %lli+i%%2,'n'||i,i%%4=0,0,%f+i from n",
+                 one, kNow));
+    const std::shared_ptr<OVClient> client = me();
+    const OVEntryQuery newest = by([](auto& q) { q.limit = 200; });
+    const OVEntry::List found = client->entries(newest);
+    ASSERT_EQ(found.size(), 200u);
+    EXPECT_EQ(found.front()->identifier(), "n100000");
+    EXPECT_EQ(found.back()->identifier(), "n99801");
+    EXPECT_EQ(SQLite::TableOf<EntryCore>::instance()->getCachedRowCount(), 200u);
+    EXPECT_EQ(client->entryCount(newest), 100004u);
+    EXPECT_EQ(client->entryCount(by([](auto& q) { q.read = true; })), 25000u);
+    const std::string plan = planOf(newest);
+    EXPECT_NE(plan.find("USING COVERING INDEX Entries_unreadcount (feed=?"), std::string::npos)
+        << plan;
+}
+
 TEST_F(OVEntryQueryTest, IsOneStatement) {
     const std::shared_ptr<OVClient> client = me();
     static_cast<void>(client->entryCount({}));
@@ -233,5 +280,8 @@ TEST_F(OVEntryQueryTest, IsOneStatement) {
     log.clear();
     EXPECT_EQ(client->entries({}).size(), 4u);
     // Beside the look at whether the file has changed.
+    EXPECT_EQ(log.count("Cursor ") - log.count("\"PRAGMA data_version\" ..."), 1);
+    log.clear();
+    EXPECT_EQ(client->entryCount(by([](auto& q) { q.read = false; })), 4u);
     EXPECT_EQ(log.count("Cursor ") - log.count("\"PRAGMA data_version\" ..."), 1);
 }

@@ -161,6 +161,14 @@ TEST_F(OVEntryTest, IsReadByOneCallTogetherWithOthers) {
     }
 }
 
+TEST_F(OVEntryTest, LeavesOutWhatIsNoEntry) {
+    const long long one = addEntry(feedID, "e1");
+    const OVEntry::List entries = {nullptr, entryOf("e1"), nullptr};
+    agent->calls.clear();
+    OVEntry::setEntries(entries, true);
+    EXPECT_EQ(agent->calls, Strings{OVFormat("setFlags(%lli,1,-1)", one)});
+}
+
 TEST_F(OVEntryTest, ReportsThatManyCouldNotBeRead) {
     addEntry(feedID, "e1");
     const OVEntry::List entries = {entryOf("e1")};
@@ -227,6 +235,28 @@ TEST_F(OVEntryTest, StaysWithItsFeed) {
     EXPECT_EQ(Support::assertionOf([&] { entry->_internal()._setFeed(nullptr); }), "newFeed");
     entry->_internal()._setFeed(feedOf());
     EXPECT_EQ(entry->feed(), feedOf());
+}
+
+TEST_F(OVEntryTest, IsOfTheFeedsOfTwoClients) {
+    addEntry(feedID, "e1");
+    const std::shared_ptr<OVClient> other =
+        OVClient::clientForBundleIdentifier("org.example.Other");
+    agent->addSubscription(other->_internal().core().getRowID(), feedID);
+    const std::shared_ptr<OVFeed> theirs = other->feedWithURL(kAddress);
+    const std::shared_ptr<OVFeed> mine = feedOf();
+    const OVEntry::List entries = mine->entries();
+    ASSERT_EQ(entries.size(), 1u);
+    EXPECT_EQ(entries[0]->feed(), mine);
+    EXPECT_EQ(theirs->entries(), entries);
+    EXPECT_EQ(entries[0]->feed(), theirs);
+}
+
+TEST_F(OVEntryTest, IsFoundWithItsFeedByItsEnclosures) {
+    write(OVFormat("insert into Enclosures (entry,url) values (%lli,'http://e.org/f')",
+                   addEntry(feedID, "e1")));
+    // By then the entry's first object is gone.
+    const std::shared_ptr<OVEnclosure> enclosure = feedOf()->entries().at(0)->enclosures().at(0);
+    EXPECT_EQ(enclosure->entry()->feed(), feedOf());
 }
 
 TEST_F(OVEntryTest, IsAnElementOfAtom) {

@@ -328,6 +328,48 @@ TEST_F(OVFeedTest, PostsAChangeWithoutListsToo) {
               (Strings{"OVFeedRefreshing", "OVFeedEntriesChanged", "OVFeedRefreshing"}));
 }
 
+TEST_F(OVFeedTest, IsRefreshedWithOthersWhileItIsInMemory) {
+    const std::shared_ptr<OVClient> client = me();
+    const std::shared_ptr<OVFeed> feed = OVFeed::create(kAddress);
+    client->refreshFeeds({nullptr, feed});
+    EXPECT_EQ(feeders.feeder->calls, "refresh(0,1) ");
+    EXPECT_TRUE(feed->isRefreshing());
+    EXPECT_TRUE(agent->calls.empty());
+    feeders.feeder->mRefreshFinished.invoke(feeders.feeder);
+}
+
+TEST_F(OVFeedTest, LogsThatItKeepsSettingsAndListensForTheAgent) {
+    const Support::LoggingOn logging({&gLog, &gLogAPI, &gLogIPC});
+    OVFeed::create(kAddress)->setSettings(OVFeedSettings());
+    EXPECT_TRUE(
+        log.contains("Storing in-memory settings for unsubscribed feed "
+                     "OVFeed[<http://example.org/feed> 0/0]"));
+    addFeed(kAddress);
+    const std::shared_ptr<OVFeed> feed = feedOf();
+    EXPECT_TRUE(feed->refresh());
+    EXPECT_TRUE(feed->refresh());
+    EXPECT_EQ(log.count(feed->description() + " listening for agent-died notifications"), 1);
+    agentDies();
+}
+
+TEST_F(OVFeedTest, EndsItsRefreshIfChangesCannotBeTold) {
+    addFeed(kAddress);
+    RecordingDelegate delegate;
+    const std::shared_ptr<OVClient> client = me();
+    client->setDelegate(&delegate);
+    const std::shared_ptr<OVFeed> feed = feedOf();
+    EXPECT_EQ(feed->unreadCount(), 0);
+    delegate.also = [&] {
+        if (delegate.told.size() > 1) return;
+        feed->_internal()._subscriptionCore()->mUnreadCount.unload();
+        write("alter table Subscriptions rename to Gone");
+    };
+    EXPECT_THROW(feed->_internal()._sendEntryNotifications(), std::exception);
+    EXPECT_FALSE(feed->isRefreshing());
+    EXPECT_EQ(delegate.told, (Strings{"begin", "end"}));
+    client->setDelegate(nullptr);
+}
+
 TEST_F(OVFeedTest, IsDueAnIntervalAfterItsLastRefresh) {
     const long long id = addFeed(kAddress);
     session.run(kMe);

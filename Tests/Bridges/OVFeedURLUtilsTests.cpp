@@ -122,3 +122,21 @@ TEST(OVFeedURLUtils, LeavesTheFilterOut) {
     EXPECT_EQ(Utils::unfilteredAggregateURLString("FEEDS:N&filter:a"), "FEEDS:N");
     EXPECT_EQ(Utils::unfilteredAggregateURLString("x&filter:a"), "x&filter:a");
 }
+
+TEST(OVFeedURLUtils, ReportsWhatItCannotTake) {
+    Support::LogCapture log;
+    EXPECT_FALSE(Utils::isKnownURL("\xff"));
+    EXPECT_TRUE(log.contains("+[OVFeedURLUtils isKnownURL:]"));
+    EXPECT_FALSE(Utils::feedURLForSourceURL("\xff"));
+    EXPECT_FALSE(Utils::parseAggregateFeedURL("\xff"));
+    EXPECT_FALSE(Utils::aggregateFeedURLForURLs({"http://e.org/", "no url"}, "Name"));
+    EXPECT_TRUE(log.contains("+[OVFeedURLUtils aggregateFeedURLForURLs:name:uuid:filter:]"));
+    EXPECT_FALSE(Utils::aggregateFeedURLForURLs({"http://e.org/"}, "\xff"));
+}
+
+TEST(OVFeedURLUtils, SortsWhatDiffersByCaseAlone) {
+    EXPECT_EQ(Utils::aggregateFeedURLForURLs({"http://e.org/a", "http://e.org/A"}, {}),
+              "feeds:&e.org/A&e.org/a");
+    EXPECT_EQ(Utils::aggregateFeedURLForURLs({"http://e.org/A", "http://e.org/a"}, {}),
+              "feeds:&e.org/A&e.org/a");
+}

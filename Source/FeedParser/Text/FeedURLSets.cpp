@@ -64,7 +64,9 @@ std::vector<Ref<String>> sortedFeeds(const FeedURLUtilsCore::URLs* urls) {
         feeds.push_back(withoutScheme(url));
     }
     std::stable_sort(feeds.begin(), feeds.end(), [](const Ref<String>& a, const Ref<String>& b) {
-        return Compare(a.get(), b.get(), Foundation::CompareOptions::CaseInsensitive) < 0;
+        const int order = Compare(a.get(), b.get(), Foundation::CompareOptions::CaseInsensitive);
+        // What differs by case alone must not stand as the caller has it.
+        return order != 0 ? order < 0 : a->view() < b->view();
     });
     return feeds;
 }
