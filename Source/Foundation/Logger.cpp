@@ -1,5 +1,6 @@
 #include "Foundation/Logger.h"
 
+#include "Foundation/PasswordMask.h"
 #include "Foundation/Switches.h"
 #include "Foundation/TypeName.h"
 #include "Foundation/Uncopyable.h"
@@ -102,6 +103,8 @@ void Logger::alwaysLogV(const char* format, std::span<const OVFormatArgument> ar
         ++mLineCount;
         std::string line(mIndentation * kIndentationStep, ' ');
         line += OVFormatV(format, arguments);
+        // Here, since URLs come into lines by many ways.
+        maskPasswords(line);
         currentSink().write(*this, line);
     } catch (...) {
         // A line that cannot be written is lost: its caller must not fail for it.

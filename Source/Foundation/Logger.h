@@ -16,7 +16,7 @@ namespace Foundation {
 /// always on. Lines go to standard error if that is a terminal, otherwise to the journal;
 /// the environment variable `OVUseSystemLog` decides where it is set.
 ///
-/// A log call never fails and never throws.
+/// A log call never fails and never throws. No line shows the password of a URL.
 struct Logger {
     const char* mName = nullptr;  ///< null for the general log
     /// Before the first use the default mode, of which 2 and above always logs; then -1.
