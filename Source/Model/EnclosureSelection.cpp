@@ -78,14 +78,15 @@ bool EnclosureCore::startAutoDownloads() {
         int{kApproved}, int{kFinished}, int{kDeleted}, attempted(), int{kFailed}, kCancelled.domain,
         kCancelled.code);
     const Ref<Foundation::ArrayOf<EnclosureCore>> wanted = query.allRows();
+    bool isAnyStarted = false;
     for (EnclosureCore* enclosure : *wanted) {
         gLogDownload.log("Starting auto-download of %@", enclosure);
         // First, so that one that cannot even be started does not stand before the others for good.
         attempted() += OVFormat(",%lli", enclosure->getRowID());
-        enclosure->download();
+        isAnyStarted |= enclosure->download();
     }
-    if (wanted->isEmpty()) gLogDownload.log("Found no enclosures to auto-download");
-    return !wanted->isEmpty();
+    if (!isAnyStarted) gLogDownload.log("Found no enclosures to auto-download");
+    return isAnyStarted;
 }
 
 void EnclosureCore::_forgetAutoDownloads() {

@@ -8,6 +8,7 @@
 #include <unistd.h>
 
 #include <cerrno>
+#include <limits>
 #include <string>
 
 namespace Orvane {
@@ -37,6 +38,9 @@ void unload(std::string path, std::string tool) {
     char* arguments[] = {tool.data(), command.data(), path.data(), nullptr};
     const pid_t child = fork();
     if (child == 0) {
+        // Libraries have descriptors of which they do not say that they are for this process alone.
+        constexpr unsigned kFirst = STDERR_FILENO + 1;
+        close_range(kFirst, std::numeric_limits<unsigned>::max(), 0);
         execv(tool.c_str(), arguments);
         _exit(errno);
     }

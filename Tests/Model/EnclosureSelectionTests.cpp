@@ -56,6 +56,17 @@ TEST_F(EnclosureSelectionTest, GetsPastOneThatCannotBeStarted) {
     EXPECT_EQ(start(), "make(2) start ");
 }
 
+TEST_F(EnclosureSelectionTest, StartsNothingWhereNothingCanBeDownloaded) {
+    const Ref<EnclosureCore> row = approved("http://e.org/a");
+    DownloaderFactory* const before = DownloaderFactory::current();
+    DownloaderFactory::setCurrent(nullptr);
+    const LogCapture log;
+    const LoggingOn on({&gLogDownload});
+    EXPECT_FALSE(EnclosureCore::startAutoDownloads());
+    DownloaderFactory::setCurrent(before);
+    EXPECT_TRUE(log.contains("[Download] Found no enclosures to auto-download"));
+}
+
 TEST_F(EnclosureSelectionTest, StartsOnlyWhatIsApproved) {
     const Ref<EnclosureCore> row = stored("http://e.org/a");
     EXPECT_EQ(start(), "");

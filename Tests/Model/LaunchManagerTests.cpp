@@ -1,7 +1,10 @@
 #include "Model/LaunchManager.h"
 
+#include "Foundation/UniqueFD.h"
 #include "Model/ClientCore.h"
 #include "Model/StorageTest.h"
+
+#include <unistd.h>
 
 #include <csignal>
 
@@ -71,6 +74,15 @@ TEST_F(LaunchManagerTest, TakesTheMissingToolsErrorForItsStatus) {
     LaunchManager::removeJob(urlOf("job.plist"), "/nonexistent/tool");
     EXPECT_EQ(log.count("LaunchManager: svcctl exited with status 2"), 1);
     EXPECT_FALSE(has("job.plist"));
+}
+
+TEST_F(LaunchManagerTest, HandsNoDescriptorOnToTheTool) {
+    const UniqueFD ours(dup(STDIN_FILENO));
+    ASSERT_TRUE(ours);
+    const std::string name = "/proc/self/fd/" + std::to_string(ours.get());
+    remove("test -e " + name + " && echo open >> '" + (base / "calls") + "'; exit 0");
+    EXPECT_FALSE(fs::exists(base / "calls"));
+    EXPECT_TRUE(fs::exists(name));
 }
 
 TEST_F(LaunchManagerTest, RemovesTheJobOfTheOldAgent) {
