@@ -71,9 +71,11 @@ void Connection::send() {
     takeTicket();
 }
 
-/// Waits for the host to have room; no time counts until then.
+/// Waits for the host to have room. That no byte comes meanwhile counts for nothing; but whoever
+/// wants a document has waited for it.
 void Connection::takeTicket() {
     mStallTimer.stop();
+    startTotalTimer();
     mTicket.reset();
     mTicket = mService.hostSlots().take(Origin::of(*mRequest->getURL()).host,
                                         [this] { startExchange(); });
@@ -104,9 +106,12 @@ bool Connection::mayUseLogin() const {
 void Connection::restartTimers() {
     mIsLastChance = false;
     mStallTimer.start(mRequest->getTimeout(), false);
-    if (mRequest->isDocument() && !mTotalTimer.isRunning()) {
-        mTotalTimer.start(ConnectionLimits::kMaxDocumentSeconds, false);
-    }
+    startTotalTimer();
+}
+
+void Connection::startTotalTimer() {
+    if (!mRequest->isDocument() || mTotalTimer.isRunning()) return;
+    mTotalTimer.start(ConnectionLimits::kMaxDocumentSeconds, false);
 }
 
 void Connection::moved() {

@@ -91,6 +91,7 @@ class Connection : public Foundation::RefCounted, private ExchangeClient {
     Foundation::Returner<Credential> credentialOfURL() const;
     void repeatWith(Credential* credential, const ProtectionSpace& space, bool isFromClient);
     void restartTimers();
+    void startTotalTimer();
     void hold(std::string_view block);
     void deliverHeld();
 

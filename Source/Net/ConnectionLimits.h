@@ -13,7 +13,7 @@ inline constexpr std::size_t kMaxDecodedRatio = 200;
 inline constexpr std::size_t kFreeDecodedBytes = std::size_t{1} << 20;
 inline constexpr int kMaxRedirects = 20;
 inline constexpr std::size_t kMaxHeaderBytes = std::size_t{256} << 10;  ///< of one response
-inline constexpr double kMaxDocumentSeconds = 300.0;  ///< from the first connection to the end
+inline constexpr double kMaxDocumentSeconds = 300.0;  ///< with the wait for the host
 inline constexpr unsigned kMaxConnectionsPerHost = 6;
 /// Of a body that nobody wants, such as a redirect's, as much is read to keep the connection.
 inline constexpr std::size_t kMaxIgnoredBytes = std::size_t{64} << 10;

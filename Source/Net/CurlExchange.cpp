@@ -30,6 +30,9 @@ namespace {
 /// Longer than ours, which decides.
 constexpr long kNoConnectTimeoutSeconds = 86400;
 
+/// A result beside libcurl's own: the client has failed.
+constexpr int kNotTaken = -1;
+
 template <class Value>
 void set(CURL* easy, CURLoption option, Value value) {
     const CURLcode result = curl_easy_setopt(easy, option, value);
@@ -309,8 +312,21 @@ void CurlExchange::flush() {
     if (mIsFlushing) return;
     const FlushMark mark(*this);
     while (mark.isAlive() && hasNews()) {
-        handOn();
+        bool isTaken = false;
+        Foundation::callGuarded(__PRETTY_FUNCTION__, [&] {
+            handOn();
+            isTaken = true;
+        });
+        if (!isTaken && mark.isAlive()) giveUp();
     }
+}
+
+/// The client has not taken what there was: what follows would be taken for the whole.
+void CurlExchange::giveUp() {
+    mHasMoved = false;
+    mHeadIsSent = true;
+    mBody.clear();
+    if (mIsRunning) mResult = kNotTaken;
 }
 
 /// One piece of news.
@@ -345,6 +361,7 @@ std::vector<std::string> CurlExchange::currentCookies() const {
 
 ExchangeEnd CurlExchange::endFor(int result) const {
     if (result == CURLE_OK) return {};
+    if (result == kNotTaken) return {NetError(NetError::kOrvane, OVInternalError), nullptr};
     // libcurl takes a line that is longer than it likes (100 KiB) for a lack of memory.
     if (mHeadIsTooLong || (result == CURLE_OUT_OF_MEMORY && !mHeadIsWhole)) {
         Foundation::gWarn.log("<%s>: more than %zu bytes of headers, or too many in one",

@@ -37,7 +37,8 @@ class CurlExchange : public Exchange {
     void finish(int result);
     /// Whether there is anything to hand on.
     bool hasNews() const;
-    /// Hands on what has come. The client may destroy the exchange.
+    /// Hands on what has come. The client may destroy the exchange. What the client throws is
+    /// reported, and ends the transfer with a failure.
     void flush();
 
  private:
@@ -62,6 +63,7 @@ class CurlExchange : public Exchange {
     bool takeHeadEnd();
     bool isRefused() const;
     void handOn();
+    void giveUp();
     std::vector<std::string> currentCookies() const;
     ExchangeEnd endFor(int result) const;
 

@@ -1,16 +1,18 @@
 #include "Net/CurlTransport.h"
 
 #include "Foundation/AssertionFailure.h"
-#include "Foundation/Guard.h"
 #include "Foundation/RunLoop.h"
 #include "Net/ConnectionLimits.h"
 #include "Net/CurlExchange.h"
 
 #include <curl/curl.h>
+#include <fcntl.h>
 #include <poll.h>
 
-#include <algorithm>
+#include <cstdlib>
 #include <ctime>
+#include <filesystem>
+#include <system_error>
 #include <utility>
 #include <vector>
 
@@ -30,6 +32,21 @@ std::int64_t monotonicMicroseconds() {
     return std::int64_t{now.tv_sec} * 1000000 + now.tv_nsec / 1000;
 }
 
+std::set<int> openDescriptors() {
+    std::set<int> descriptors;
+    std::error_code error;
+    for (const auto& entry : std::filesystem::directory_iterator("/proc/self/fd", error)) {
+        descriptors.insert(std::atoi(entry.path().filename().c_str()));
+    }
+    // Without the one that it was read by.
+    std::erase_if(descriptors, [](int fd) { return fcntl(fd, F_GETFD) < 0; });
+    return descriptors;
+}
+
+void closeInChildren(int fd) {
+    fcntl(fd, F_SETFD, FD_CLOEXEC);
+}
+
 template <class Value>
 void set(CURLM* multi, CURLMoption option, Value value) {
     OV_ASSERT(curl_multi_setopt(multi, option, value) == CURLM_OK);
@@ -42,7 +59,12 @@ class CurlTransport::Multi : Foundation::Uncopyable {
  public:
     explicit Multi(CurlTransport& transport) {
         OV_ASSERT(curl_global_init(CURL_GLOBAL_DEFAULT) == CURLE_OK);
+        const std::set<int> others = openDescriptors();
         mHandle = curl_multi_init();
+        // Those by which it wakes itself up; processes that this one starts would inherit them.
+        for (const int fd : openDescriptors()) {
+            if (!others.contains(fd)) closeInChildren(fd);
+        }
         OV_ASSERT(mHandle);
         set(mHandle, CURLMOPT_SOCKETFUNCTION, &Multi::socketCallback);
         set(mHandle, CURLMOPT_SOCKETDATA, &transport);
@@ -153,7 +175,11 @@ void CurlTransport::watch(int socket, int what) {
         return;
     }
     std::unique_ptr<SocketSource>& source = mSockets[socket];
-    if (!source) source = std::make_unique<SocketSource>(*this, socket);
+    if (!source) {
+        // The resolver's are made by libcurl itself.
+        closeInChildren(socket);
+        source = std::make_unique<SocketSource>(*this, socket);
+    }
     short events = 0;
     if (what & CURL_POLL_IN) events |= POLLIN;
     if (what & CURL_POLL_OUT) events |= POLLOUT;
@@ -187,7 +213,7 @@ void CurlTransport::flush() {
     const std::vector<CurlExchange*> exchanges(mExchanges.begin(), mExchanges.end());
     for (CurlExchange* exchange : exchanges) {
         if (!mExchanges.contains(exchange) || !exchange->hasNews()) continue;
-        Foundation::callGuarded(__PRETTY_FUNCTION__, [&] { exchange->flush(); });
+        exchange->flush();
     }
 }
 

@@ -11,7 +11,7 @@
 namespace Orvane {
 
 /// Lets no more than so many exchanges with one host run at a time; the others wait, in their
-/// order. No time counts while they do.
+/// order, for as long as those who hold their tickets want.
 class HostSlots : Foundation::Uncopyable {
  public:
     /// A place in a host's row: one of those that may run, or one of those that wait. Its end gives

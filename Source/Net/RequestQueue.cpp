@@ -1,6 +1,7 @@
 #include "Net/RequestQueue.h"
 
 #include "Foundation/AssertionFailure.h"
+#include "Foundation/Guard.h"
 #include "Foundation/Logger.h"
 
 #include <algorithm>
@@ -30,7 +31,12 @@ void RequestQueue::addRequest(Request* req) {
         return;
     }
     gLogQueue.log("Added request[%u] and starting it", count);
-    req->startRequest();
+    try {
+        req->startRequest();
+    } catch (...) {
+        removeRequest(req);
+        throw;
+    }
 }
 
 void RequestQueue::removeRequest(Request* req) {
@@ -43,11 +49,21 @@ void RequestQueue::removeRequest(Request* req) {
     gLogQueue.log("Removed request[%u] now [%d]", index, static_cast<int>(mRequests.size()));
     if (index < mLimit && mRequests.size() >= mLimit) {
         gLogQueue.log("Starting request[%u]", mLimit - 1);
-        const Ref<Request> next = mRequests[mLimit - 1];
-        next->startRequest();
+        startMovedUp();
     }
     // Its caller may be working in it.
     removed = nullptr;
+}
+
+/// What it throws is none of the business of whoever has left.
+void RequestQueue::startMovedUp() {
+    const Ref<Request> next = mRequests[mLimit - 1];
+    bool hasStarted = false;
+    Foundation::callGuarded(__PRETTY_FUNCTION__, [&] {
+        next->startRequest();
+        hasStarted = true;
+    });
+    if (!hasStarted) removeRequest(next);
 }
 
 }  // namespace Orvane

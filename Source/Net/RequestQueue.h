@@ -20,10 +20,12 @@ class RequestQueue : Foundation::Uncopyable {
     explicit RequestQueue(unsigned limit) : mLimit(limit) {}
 
     /// Starts the request, now or when it has moved up. Throws `AssertionFailure` for null and for
-    /// a request that is in the queue already.
+    /// a request that is in the queue already, and what a start throws, which leaves the request
+    /// out of the queue.
     void addRequest(Request* request);
-    /// Takes the request out, and starts the one that moves up by that. Does nothing for one that
-    /// is not in the queue. Throws `AssertionFailure` for null.
+    /// Takes the request out, and starts the one that moves up by that; one whose start throws is
+    /// taken out too, with a report. Does nothing for one that is not in the queue. Throws
+    /// `AssertionFailure` for null.
     void removeRequest(Request* request);
 
     const std::vector<Foundation::Ref<Request>>& requests() const { return mRequests; }
@@ -32,6 +34,7 @@ class RequestQueue : Foundation::Uncopyable {
     using Requests = std::vector<Foundation::Ref<Request>>;
 
     Requests::iterator find(const Request* request);
+    void startMovedUp();
 
     const unsigned mLimit;
     Requests mRequests;

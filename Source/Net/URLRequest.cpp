@@ -2,10 +2,15 @@
 
 #include "Foundation/AssertionFailure.h"
 #include "Foundation/Guard.h"
+#include "Foundation/RunOnceTimer.h"
 #include "Net/Connection.h"
 #include "Net/MemoryReturn.h"
 #include "Net/RequestQueue.h"
 #include "Net/URLDownload.h"
+
+#include <Orvane/OVErrorCode.h>
+
+#include <utility>
 
 namespace Orvane {
 
@@ -94,7 +99,21 @@ void URLRequest::start(bool priority) {
 }
 
 void URLRequest::startRequest() {
-    _open(true);
+    try {
+        _open(true);
+    } catch (...) {
+        Foundation::warnAboutCurrentException(__PRETTY_FUNCTION__);
+        close();
+        mCouldNotStart = true;
+        Foundation::callAfterDelay<URLRequest>(0.0, this, &URLRequest::couldNotStart);
+    }
+}
+
+/// Whoever waits for it hears of that as of any failure, and so not before `start` has returned.
+void URLRequest::couldNotStart() {
+    if (std::exchange(mCouldNotStart, false)) {
+        _didFail(NetError(NetError::kOrvane, OVInternalError));
+    }
 }
 
 void URLRequest::_open(bool schedule) {
@@ -116,6 +135,7 @@ void URLRequest::stop() {
 }
 
 void URLRequest::close() {
+    mCouldNotStart = false;
     if (!mConnection) return;
     mChallenge = nullptr;
     const Ref<Connection> connection = std::move(mConnection);

@@ -38,7 +38,8 @@ class URLRequest : public Request {
     /// Warns if it still runs.
     ~URLRequest() override;
 
-    /// Begins at once with `priority`; otherwise in its turn of `RequestQueue::networkQueue`.
+    /// Begins at once with `priority`; otherwise in its turn of `RequestQueue::networkQueue`. What
+    /// keeps it from beginning is reported, and fails the request with `OVInternalError`.
     void start(bool priority);
     /// Ends what runs or waits, without an action.
     void stop();
@@ -107,6 +108,7 @@ class URLRequest : public Request {
     class Client;
 
     void _open(bool schedule);
+    void couldNotStart();
     void close();
     void failed();
     void _didReceiveAuthenticationChallenge(AuthenticationChallenge* challenge);
@@ -115,6 +117,7 @@ class URLRequest : public Request {
 
     std::unique_ptr<Client> mClient;
     Foundation::Ref<Foundation::URL> mStoredFor;
+    bool mCouldNotStart = false;  ///< and has not said so yet
 };
 
 }  // namespace Orvane

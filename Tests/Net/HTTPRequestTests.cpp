@@ -236,7 +236,7 @@ TEST_F(HTTPRequestTest, AsksForNoMoreThanSixThingsOfAHostAtOnce) {
     other->start(true);
     turn();
     EXPECT_EQ(network().asked().size(), 7u);
-    // No time counts for those that wait.
+    // That those who wait get no byte is nothing to them.
     const RequestRecorder waiting(*requests[7]);
     mClock.advanceBy(119);
     for (auto* pending : network().pending()) {
@@ -252,6 +252,48 @@ TEST_F(HTTPRequestTest, AsksForNoMoreThanSixThingsOfAHostAtOnce) {
         request->stop();
     }
     other->stop();
+}
+
+TEST_F(HTTPRequestTest, WaitsForAHostNoLongerThanForADocument) {
+    std::vector<Ref<HTTPRequest>> files;
+    for (int i = 0; i < 6; ++i) {
+        files.push_back(get("http://a/"));
+        files.back()->setAccumulatesData(false);
+        files.back()->start(true);
+    }
+    const auto document = get("http://a/feed");
+    const RequestRecorder waiting(*document);
+    document->start(true);
+    const auto file = get("http://a/file");
+    const RequestRecorder patient(*file);
+    file->setAccumulatesData(false);
+    file->start(true);
+    turn();
+    const auto sendBytes = [this] {
+        mClock.advanceBy(99.5);
+        for (auto* pending : network().pending()) {
+            pending->sendBody("x");
+        }
+    };
+    for (auto* pending : network().pending()) {
+        pending->sendHead(200);
+    }
+    for (int i = 0; i < 3; ++i) {
+        sendBytes();
+    }
+    EXPECT_EQ(waiting.notes, Notes{"opened"});
+    const Support::LogCapture log;
+    sendBytes();
+    EXPECT_EQ(waiting.notes.back(), "failed 15 -1001");
+    EXPECT_TRUE(log.contains("<http://a/feed>: not complete in 300 seconds"));
+    // The place goes to the next.
+    EXPECT_EQ(patient.notes, Notes{"opened"});
+    files[0]->stop();
+    EXPECT_EQ(network().asked().back(), "GET http://a/file");
+    for (const auto& request : files) {
+        request->stop();
+    }
+    file->stop();
 }
 
 }  // namespace

@@ -6,6 +6,7 @@
 
 #include <gtest/gtest.h>
 
+#include <stdexcept>
 #include <string>
 #include <vector>
 
@@ -21,7 +22,12 @@ class RequestQueueTest : public testing::Test {
      public:
         Item(std::string name, std::vector<std::string>& started)
             : mName(std::move(name)), mStarted(started) {}
-        void startRequest() override { mStarted.push_back(mName); }
+        void startRequest() override {
+            if (isBroken) throw std::runtime_error("no");
+            mStarted.push_back(mName);
+        }
+
+        bool isBroken = false;
 
      private:
         std::string mName;
@@ -107,6 +113,28 @@ TEST_F(RequestQueueTest, RefusesNullAndWhatItHasAlready) {
     EXPECT_EQ(Support::assertionOf([&] { queue.addRequest(nullptr); }), "req");
     EXPECT_EQ(Support::assertionOf([&] { queue.removeRequest(nullptr); }), "req");
     EXPECT_EQ(Support::assertionOf([&] { queue.addRequest(one); }), "where==mRequests.end()");
+}
+
+TEST_F(RequestQueueTest, KeepsNothingThatCannotBeStarted) {
+    RequestQueue queue(1);
+    const auto broken = item("a");
+    broken->isBroken = true;
+    EXPECT_THROW(queue.addRequest(broken), std::runtime_error);
+    EXPECT_TRUE(queue.requests().empty());
+    add(queue, "b");
+    EXPECT_EQ(started(), "b");
+}
+
+TEST_F(RequestQueueTest, GetsPastWaitingOnesThatCannotBeStarted) {
+    const Support::LogCapture log;
+    RequestQueue queue(1);
+    const auto items = add(queue, "abcd");
+    items[1]->isBroken = items[2]->isBroken = true;
+    queue.removeRequest(items[0]);
+    EXPECT_EQ(started(), "ad");
+    ASSERT_EQ(queue.requests().size(), 1u);
+    EXPECT_EQ(queue.requests().front(), items[3]);
+    EXPECT_EQ(log.count("std::runtime_error \"no\" caught in"), 2);
 }
 
 TEST_F(RequestQueueTest, RunsFourFromTheNetworkAtOnce) {

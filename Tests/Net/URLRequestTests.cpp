@@ -233,6 +233,66 @@ TEST_F(URLRequestTest, ReportsWhatACallbackThrowsWithItsSignature) {
     EXPECT_EQ(request->getResponseData()->view(), "x");
 }
 
+/// One that cannot begin.
+class Unmade : public URLRequest {
+ public:
+    using URLRequest::URLRequest;
+    ConnectionRequest* _getRequest() override { throw std::runtime_error("no"); }
+};
+
+TEST_F(URLRequestTest, FailsWhereItCannotBegin) {
+    const Ref<Unmade> request =
+        Foundation::Returner<Unmade>::adopted(new Unmade(url("http://a/").get()));
+    const RequestRecorder recorder(*request);
+    for (const bool priority : {true, false}) {
+        const Support::LogCapture log;
+        request->start(priority);
+        // Whoever starts it hears of it behind that.
+        EXPECT_TRUE(log.contains("std::runtime_error \"no\" caught in"));
+        EXPECT_TRUE(recorder.notes.empty() || !priority);
+        turn();
+        EXPECT_EQ(recorder.notes.back(), "failed 1002 1");
+        EXPECT_EQ(recorder.notes.size(), priority ? 1u : 2u);
+        EXPECT_TRUE(RequestQueue::networkQueue().requests().empty());
+    }
+}
+
+TEST_F(URLRequestTest, LetsOthersBeginWhereItCannot) {
+    std::vector<Ref<URLRequest>> running;
+    for (int i = 0; i < 4; ++i) {
+        running.push_back(get("http://a/"));
+        running.back()->start(false);
+    }
+    const Ref<Unmade> unmade =
+        Foundation::Returner<Unmade>::adopted(new Unmade(url("http://b/").get()));
+    const RequestRecorder recorder(*unmade);
+    unmade->start(false);
+    const auto last = get("http://c/");
+    last->start(false);
+    const Support::LogCapture log;
+    turn();
+    running[0]->stop();
+    turn();
+    EXPECT_EQ(recorder.notes, Notes{"failed 1002 1"});
+    EXPECT_EQ(network().asked().back(), "GET http://c/");
+    for (const auto& request : running) {
+        request->stop();
+    }
+    last->stop();
+}
+
+TEST_F(URLRequestTest, SaysNothingOfAFailedStartOnceStopped) {
+    const Ref<Unmade> request =
+        Foundation::Returner<Unmade>::adopted(new Unmade(url("http://a/").get()));
+    const RequestRecorder recorder(*request);
+    const Support::LogCapture log;
+    request->start(false);
+    request->stop();
+    turn();
+    EXPECT_TRUE(recorder.notes.empty());
+    EXPECT_TRUE(RequestQueue::networkQueue().requests().empty());
+}
+
 TEST_F(URLRequestTest, GivesUpAfter120SecondsWithoutAByte) {
     begin("http://a/");
     mClock.advanceBy(119);
