@@ -104,6 +104,10 @@ bool LaunchListener::registerEvent(std::uintptr_t ident, std::int16_t filter, st
     return false;
 }
 
+bool LaunchListener::hasSockets() const {
+    return mConfigDict && mConfigDict->get(ServiceManager::kSockets);
+}
+
 const Array* LaunchListener::getSocketListeners(const char* name) const {
     if (!mConfigDict) {
         gWarn.log("LaunchListener: getSocketListeners failed - no svcd configDict");

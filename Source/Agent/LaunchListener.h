@@ -52,6 +52,8 @@ class LaunchListener : Foundation::Uncopyable {
 
     /// Whether the service manager started the process.
     bool isManaged() const { return mConfigDict.get() != nullptr; }
+    /// Whether the service manager has listened on sockets for the process.
+    bool hasSockets() const;
     int getEventQueue() const { return mEventQueue.getDescriptor(); }
 
  private:

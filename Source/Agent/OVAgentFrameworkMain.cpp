@@ -1,5 +1,6 @@
 #include "Agent/OVAgentFrameworkMain.h"
 
+#include "Agent/AbsentRenderer.h"
 #include "Agent/AgentLock.h"
 #include "Agent/AgentName.h"
 #include "Agent/AgentPorts.h"
@@ -38,16 +39,22 @@ bool isAgent(AgentLock& lock) {
 }
 
 /// Whether there is anything to be run.
-bool setUp(AgentTask& task, AgentLock& lock) {
+bool setUp(AgentTask& task, AgentLock& lock, AbsentRenderer& renderer) {
     const AutoreleasePool pool;
     gLog.log("----- Orvane Agent STARTING -----");
-    LaunchListener::instance()->registerSignal(SIGTERM);
+    LaunchListener& listener = *LaunchListener::instance();
+    listener.registerSignal(SIGTERM);
     std::signal(SIGPIPE, SIG_IGN);
     // First of all that touches the database: there are never two who write to it.
-    if (!isAgent(lock)) return false;
+    if (!isAgent(lock)) {
+        // This one was started for them, and would be again.
+        AbsentRenderer::turnAwayWaiting(listener);
+        return false;
+    }
     task.start(true);
     gLog.log("Orvane Agent starting API MIG server");
     IPCServer::startServer();
+    renderer.startServer(listener);
     gLog.log("Orvane Agent finished setup; starting runloop");
     return true;
 }
@@ -55,8 +62,9 @@ bool setUp(AgentTask& task, AgentLock& lock) {
 void run() {
     const AgentPorts ports;
     AgentLock lock;
+    AbsentRenderer renderer;
     AgentTask task;
-    if (!setUp(task, lock)) return;
+    if (!setUp(task, lock, renderer)) return;
     RunLoop::current().run();
     gLog.log("Orvane Agent exited runloop");
     AgentName::giveUp();

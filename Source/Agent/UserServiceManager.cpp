@@ -15,6 +15,7 @@
 #include <algorithm>
 #include <cerrno>
 #include <cstdlib>
+#include <ctime>
 #include <fstream>
 #include <limits>
 #include <string_view>
@@ -71,14 +72,36 @@ BusMessage& closeProperty(BusMessage& message) {
     return message.close().close();
 }
 
-/// The call that makes a timer, with the service of the same stem, `microseconds` from now.
-BusMessage newTimerCall(const std::string& timer, std::uint64_t microseconds) {
+/// As the manager reads dates; empty for one that it does not, as those beyond 2199.
+std::string getCalendarText(std::uint64_t seconds) {
+    constexpr std::uint64_t kMost = 7226582400;  // 2199-01-01
+    const double now = Clock::current().now() + kUnixEpochOffset;
+    if (now < 0 || seconds > kMost || now + static_cast<double>(seconds) > double{kMost}) return {};
+    const auto date = static_cast<std::time_t>(now + static_cast<double>(seconds));
+    std::tm fields = {};
+    gmtime_r(&date, &fields);
+    char text[sizeof "2199-01-01 00:00:00 UTC"];
+    const std::size_t length = std::strftime(text, sizeof text, "%Y-%m-%d %H:%M:%S UTC", &fields);
+    return std::string(text, length);
+}
+
+/// The call that makes a timer, with the service of the same stem, that is due `seconds` from now.
+///
+/// The date counts the time that the machine sleeps; the span is there for a clock that is set
+/// back. Whichever comes first starts the service, and the other, if it comes at all, finds it
+/// running: the date is never the later one, for it is cut to a whole second.
+BusMessage newTimerCall(const std::string& timer, std::uint64_t seconds) {
     BusMessage call = Bus::user().newCall(managerMethod("StartTransientUnit"));
     call.append(timer).append("replace").open('a', "(sv)");
     closeProperty(openProperty(call, "Description", "s").append("Next work of Orvane's agent"));
     openProperty(call, "TimersMonotonic", "a(st)").open('a', "(st)").open('r', "st");
-    call.append("OnActiveSec").append(microseconds).close().close();
+    call.append("OnActiveSec").append(seconds * kMicroseconds).close().close();
     closeProperty(call);
+    if (const std::string date = getCalendarText(seconds); !date.empty()) {
+        openProperty(call, "TimersCalendar", "a(ss)").open('a', "(ss)").open('r', "ss");
+        call.append("OnCalendar").append(date).close().close();
+        closeProperty(call);
+    }
     closeProperty(openProperty(call, "AccuracyUSec", "t").append(kAccuracyMicroseconds));
     closeProperty(openProperty(call, "RemainAfterElapse", "b").append(false));
     call.close().open('a', "(sa(sv))").close();
@@ -87,12 +110,12 @@ BusMessage newTimerCall(const std::string& timer, std::uint64_t microseconds) {
 
 /// The timer that waits, if there is one, ends in the manager's own time behind the answer; until
 /// then another of its name cannot be made.
-int replaceTimer(const std::string& timer, std::uint64_t microseconds) {
+int replaceTimer(const std::string& timer, std::uint64_t seconds) {
     Bus& bus = Bus::user();
     const BusMessage stopped = bus.callMethod(managerMethod("StopUnit"), timer, "replace");
     if (!stopped.isValid() && !isError(stopped, "NoSuchUnit")) return EIO;
     for (int i = 0; i < UserServiceManager::kTimerTries; ++i) {
-        BusMessage call = newTimerCall(timer, microseconds);
+        BusMessage call = newTimerCall(timer, seconds);
         const BusMessage started = bus.call(call, UserServiceManager::kTimeoutSeconds);
         if (started.isValid()) return 0;
         if (!isError(started, "UnitExists")) {
@@ -205,7 +228,7 @@ int UserServiceManager::setStartInterval(std::int64_t seconds) {
     constexpr std::uint64_t kMost = std::numeric_limits<std::int64_t>::max() / kMicroseconds;
     const std::uint64_t bounded =
         std::min(kMost, static_cast<std::uint64_t>(std::max<std::int64_t>(0, seconds)));
-    return replaceTimer(stem + ".timer", bounded * kMicroseconds);
+    return replaceTimer(stem + ".timer", bounded);
 }
 
 }  // namespace Orvane

@@ -17,7 +17,8 @@ class UserServiceManager : public ServiceManager {
 
     bool isManaged() override;
     Reply checkIn() override;
-    /// EOPNOTSUPP unless the process is a unit.
+    /// EOPNOTSUPP unless the process is a unit. The time that the machine sleeps counts; it is not
+    /// woken up.
     int setStartInterval(std::int64_t seconds) override;
 
  private:

@@ -284,6 +284,32 @@ TEST_F(AgentActivation, StartsForALookUp) {
 class AgentSocket : public AgentProcess {
  protected:
     std::string path() const { return home / "Render.socket"; }
+    /// Lets systemd listen.
+    void startSocket() {
+        std::string variables;
+        for (const char* name : {"HOME", "XDG_DATA_HOME", "XDG_CONFIG_HOME", "XDG_RUNTIME_DIR",
+                                 "DBUS_SESSION_BUS_ADDRESS", "DBUS_SYSTEM_BUS_ADDRESS", "OVLog",
+                                 "OVLogIPC", "OVUseSystemLog"}) {
+            variables += std::string(" -E ") + name;
+        }
+        const std::string command = "exec systemd-socket-activate --listen='" + path() +
+                                    "' --fdname=Render" + variables + " " ORVANE_AGENT " 2> '" +
+                                    (home / "log") + "'";
+        agent.emplace(std::vector<std::string>{"sh", "-c", command});
+    }
+    UniqueFD connectWhenItListens() const {
+        UniqueFD connection;
+        EXPECT_TRUE(turnUntil([&] {
+            connection = connectToIt();
+            return static_cast<bool>(connection);
+        }));
+        return connection;
+    }
+    /// Waits for the other end to be closed.
+    static bool isEnded(const UniqueFD& connection) {
+        char byte = 0;
+        return turnUntil([&] { return recv(connection.get(), &byte, 1, MSG_DONTWAIT) == 0; });
+    }
     UniqueFD connectToIt() const {
         sockaddr_un address = {};
         address.sun_family = AF_UNIX;
@@ -299,24 +325,22 @@ class AgentSocket : public AgentProcess {
 };
 
 TEST_F(AgentSocket, StartsForAConnection) {
-    std::string variables;
-    for (const char* name :
-         {"HOME", "XDG_DATA_HOME", "XDG_CONFIG_HOME", "XDG_RUNTIME_DIR", "DBUS_SESSION_BUS_ADDRESS",
-          "DBUS_SYSTEM_BUS_ADDRESS", "OVLog", "OVLogIPC", "OVUseSystemLog"}) {
-        variables += std::string(" -E ") + name;
-    }
-    const std::string command = "exec systemd-socket-activate --listen='" + path() +
-                                "' --fdname=Render" + variables + " " ORVANE_AGENT " 2> '" +
-                                (home / "log") + "'";
-    agent.emplace(std::vector<std::string>{"sh", "-c", command});
-    UniqueFD connection;
-    ASSERT_TRUE(turnUntil([&] {
-        connection = connectToIt();
-        return static_cast<bool>(connection);
-    }));
+    startSocket();
+    const UniqueFD connection = connectWhenItListens();
     ASSERT_TRUE(hasLogged(kRunning)) << log();
     EXPECT_THAT(log(), HasSubstr("    ... checked in with svcd!"));
+    // It is told that there are no pages, and does not wait to start the next agent too.
+    EXPECT_TRUE(isEnded(connection));
     EXPECT_EQ(end(SIGTERM), 0);
+}
+
+TEST_F(AgentSocket, LeavesNoConnectionWaitingWhereAnotherIsTheAgent) {
+    ASSERT_TRUE(Bus::user().requestName(BusCenter::kAgentName));
+    startSocket();
+    const UniqueFD connection = connectWhenItListens();
+    EXPECT_TRUE(isEnded(connection)) << log();
+    EXPECT_THAT(log(), HasSubstr("Another process owns com.tarnwick.orvane.ipc"));
+    Bus::user().releaseName(BusCenter::kAgentName);
 }
 
 }  // namespace

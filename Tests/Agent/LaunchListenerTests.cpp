@@ -1,6 +1,6 @@
 #include "Agent/LaunchListener.h"
 
-#include "Agent/AgentTest.h"
+#include "Agent/LaunchListenerTest.h"
 #include "Agent/ServerSocket.h"
 #include "Foundation/ArrayOf.h"
 #include "Foundation/Number.h"
@@ -25,7 +25,6 @@ using namespace Orvane;
 using testing::ElementsAre;
 using testing::IsEmpty;
 using Reply = ServiceManager::Reply;
-using Values = MutableDictionaryOf<String, PFRefCounted>;
 using Strings = std::vector<std::string>;
 
 namespace {
@@ -59,72 +58,6 @@ class NoMoreDescriptors {
     rlimit mLimit = {};
 };
 #endif
-
-class LaunchListenerTest : public testing::Test {
- protected:
-    ~LaunchListenerTest() noexcept override = default;
-
-    /// A socket that listens, in the test's directory.
-    int listen(const char* name) {
-        UniqueFD made(socket(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC | SOCK_NONBLOCK, 0));
-        const sockaddr_un address = addressOf(name);
-        EXPECT_EQ(bind(made.get(), reinterpret_cast<const sockaddr*>(&address), sizeof address), 0);
-        EXPECT_EQ(::listen(made.get(), 5), 0);
-        mListeners.push_back(std::move(made));
-        return mListeners.back().get();
-    }
-    UniqueFD connectTo(const char* name) const {
-        UniqueFD made(socket(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC, 0));
-        const sockaddr_un address = addressOf(name);
-        EXPECT_EQ(connect(made.get(), reinterpret_cast<const sockaddr*>(&address), sizeof address),
-                  0);
-        return made;
-    }
-    /// The manager hands over these under a name.
-    void give(const char* name, std::initializer_list<int> descriptors) {
-        const Ref<MutableArrayOf<Number>> array = MutableArrayOf<Number>::array();
-        for (const int descriptor : descriptors) {
-            const Ref<Number> number = Number::number(descriptor);
-            array->add(number);
-        }
-        const Ref<Values> sockets = Values::dictionary();
-        set(*sockets, name, array);
-        reply("Sockets", sockets);
-    }
-    void reply(const char* key, PFRefCounted* value) {
-        if (!services.reply.dictionary) services.reply.dictionary = Values::dictionary();
-        services.reply.type = Reply::kDictionary;
-        if (key) set(static_cast<Values&>(*services.reply.dictionary), key, value);
-    }
-    static void set(Values& values, const char* key, PFRefCounted* value) {
-        const Ref<String> string = String::string(key);
-        values.set(string, value);
-    }
-    void make() { listener = std::make_unique<LaunchListener>(services); }
-    static void turn() { RunLoop::current().turn(); }
-    /// What was said while the listener was made.
-    Strings sayings() {
-        log.clear();
-        make();
-        return log.lines();
-    }
-
-    AutoreleasePool pool;
-    Support::TempDir directory;
-    Support::LogCapture log;
-    Support::LoggingOn logging{{&gLogIPC}};
-    FakeServiceManager services;
-    std::unique_ptr<LaunchListener> listener;
-
- private:
-    sockaddr_un addressOf(const char* name) const {
-        sockaddr_un address = {};
-        address.sun_family = AF_UNIX;
-        std::strncpy(address.sun_path, (directory / name).c_str(), sizeof address.sun_path - 1);
-        return address;
-    }
-    std::vector<UniqueFD> mListeners;
-};
 
 TEST_F(LaunchListenerTest, IsContentWithoutAManager) {
     services.managed = false;

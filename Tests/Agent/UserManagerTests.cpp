@@ -95,12 +95,18 @@ TEST_F(UserManager, StartsTheAgentForACallAndEndsItInOrder) {
 TEST_F(UserManager, StartsTheAgentForAConnection) {
     const std::string out = inManager(
         "systemctl --user start orvane-agent.socket\n"
-        "python3 -c 'import os, socket; s = socket.socket(socket.AF_UNIX); "
-        "s.connect(os.environ[\"XDG_RUNTIME_DIR\"] + \"/Orvane/Render.socket\")'\n"
-        "until systemctl --user is-active orvane-agent.service; do :; done | tail -n 1\n"
+        // There are no pages, which it says by the end of the connection: one that waited on would
+        // start the next agent whenever one has quit.
+        "python3 -c 'import os, socket; s = socket.socket(socket.AF_UNIX); s.settimeout(60); "
+        "s.connect(os.environ[\"XDG_RUNTIME_DIR\"] + \"/Orvane/Render.socket\"); "
+        "print(s.recv(1))'\n"
+        "systemctl --user is-active orvane-agent.service\n"
+        "systemctl --user stop orvane-agent.service\n"
+        "systemctl --user show --property=SubState orvane-agent.socket\n"
         "systemctl --user stop orvane-agent.socket\n");
     SKIP_WITHOUT_MANAGER();
-    EXPECT_EQ(out, "active\n");
+    EXPECT_EQ(out, "b''\nactive\nSubState=listening\n");
+    EXPECT_EQ(log().find("STARTING"), log().rfind("STARTING"));
     EXPECT_THAT(log(), HasSubstr("    ... checked in with svcd!"));
 }
 
@@ -147,13 +153,18 @@ TEST_F(UserManager, StartsAServiceAgainWhenItAsked) {
         "cat " +
         (home / "runs") +
         "\n"
-        "systemctl --user show --property=Unit,TimersMonotonic orvane-agent.timer | "
-        "sed 's/ next_elapse.*//'\n"
+        "show() { systemctl --user show --property=$1 orvane-agent.timer; }\n"
+        "show Unit,TimersMonotonic,WakeSystem | sed 's/ next_elapse.*//'\n"
+        // The date counts the time that the machine sleeps.
+        "date=$(show TimersCalendar | sed 's/.* OnCalendar=\\(.* UTC\\) ;.*/\\1/')\n"
+        "left=$(($(date --date=\"$date\" +%s) - $(date +%s)))\n"
+        "[ $left -le 3600 -a $left -ge 3300 ] || show TimersCalendar\n"
+        "show NextElapseUSecRealtime | grep --count --fixed-strings \"$(echo $date)\"\n"
         "systemctl --user list-timers --all --no-legend | wc -l\n");
     SKIP_WITHOUT_MANAGER();
     EXPECT_EQ(out,
               "managed 0\nmanaged 0\nUnit=orvane-agent.service\n"
-              "TimersMonotonic={ OnActiveUSec=1h ;\n1\n");
+              "TimersMonotonic={ OnActiveUSec=1h ;\nWakeSystem=no\n1\n1\n");
 }
 
 /// In the machine's own time: 15 seconds of idling. Without feeds the rest is a year, as systemd
