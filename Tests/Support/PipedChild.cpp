@@ -1,6 +1,7 @@
 #include "Support/PipedChild.h"
 
 #include <fcntl.h>
+#include <poll.h>
 #include <spawn.h>
 #include <sys/wait.h>
 #include <unistd.h>
@@ -54,8 +55,11 @@ PipedChild::~PipedChild() {
 }
 
 std::string PipedChild::readLine() {
+    constexpr int kMilliseconds = 120'000;
     std::string line;
-    for (char c; read(mOutput.get(), &c, 1) == 1 && c != '\n';) {
+    pollfd wanted = {.fd = mOutput.get(), .events = POLLIN, .revents = 0};
+    for (char c; poll(&wanted, 1, kMilliseconds) == 1 && read(mOutput.get(), &c, 1) == 1;) {
+        if (c == '\n') return line;
         line += c;
     }
     return line;

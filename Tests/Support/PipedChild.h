@@ -20,7 +20,7 @@ class PipedChild {
     PipedChild& operator=(const PipedChild&) = delete;
 
     /// Waits for the next line that it writes, and gives it without its end. Empty when it has
-    /// closed its output.
+    /// closed its output, and when it is silent for two minutes.
     std::string readLine();
     /// Ends its input.
     void closeInput();
