@@ -10,9 +10,13 @@
 #include "Model/AuthorCore.h"
 #include "Model/EnclosureCore.h"
 #include "Model/EntryCore.h"
+#include "Model/FeedCore.h"
 #include "Model/SyncPlanner.h"
 #include "SQLite/Database.h"
 #include "SQLite/Transaction.h"
+
+#include <map>
+#include <vector>
 
 namespace Orvane {
 
@@ -22,6 +26,44 @@ using Foundation::Ref;
 using Foundation::Returner;
 using Foundation::String;
 using Foundation::URL;
+
+namespace {
+
+/// All of them, before any is changed: a call that is refused for one that is not there must leave
+/// nothing behind that the next call would save.
+std::vector<Ref<EntryCore>> rowsOf(IPCRowIDs entries) {
+    std::vector<Ref<EntryCore>> rows;
+    rows.reserve(entries.size());
+    for (const std::int64_t entry : entries) {
+        const AutoreleasePool pool;
+        rows.emplace_back(EntryCore::getRow(entry));
+    }
+    return rows;
+}
+
+/// How many have changed. Those that are unread are counted once for each feed: to count them for
+/// each entry takes minutes where a client marks all of a long feed.
+unsigned changeFlags(const std::vector<Ref<EntryCore>>& rows, std::int32_t read,
+                     std::int32_t flagged) {
+    std::map<SQLite::RowID, Ref<FeedCore>> feeds;
+    unsigned changed = 0;
+    for (const Ref<EntryCore>& row : rows) {
+        const AutoreleasePool pool;
+        const bool wasRead = row->mRead;
+        const bool isRead = read < 0 ? wasRead : read > 0;
+        const bool isFlagged = flagged < 0 ? row->mFlagged.getValue() : flagged > 0;
+        if (row->changeFlags(isRead, isFlagged, false)) ++changed;
+        FeedCore* feed = isRead != wasRead ? row->getFeed() : nullptr;
+        if (feed) feeds.try_emplace(feed->getRowID(), feed);
+    }
+    for (const auto& [rowID, feed] : feeds) {
+        const AutoreleasePool pool;
+        feed->updateUnreadCounts();
+    }
+    return changed;
+}
+
+}  // namespace
 
 void ipc_impl_entry_setContent(std::int64_t entry, const std::string& column, IPCBytes text,
                                IPCBytes data) {
@@ -39,14 +81,7 @@ void ipc_impl_entry_setAuthor(std::int64_t entry, std::int64_t author) {
 
 void ipc_impl_entries_setflags(IPCRowIDs entries, std::int32_t read, std::int32_t flagged) {
     const SQLite::Transaction transaction(true);
-    unsigned changed = 0;
-    for (const std::int64_t entry : entries) {
-        const AutoreleasePool pool;
-        EntryCore* row = EntryCore::getRow(entry);
-        const bool isRead = read < 0 ? row->mRead.getValue() : read > 0;
-        const bool isFlagged = flagged < 0 ? row->mFlagged.getValue() : flagged > 0;
-        if (row->changeFlags(isRead, isFlagged, true)) ++changed;
-    }
+    const unsigned changed = changeFlags(rowsOf(entries), read, flagged);
     gLogIPC.log("setFlags: Changed %u of %u entries to (read=%i, flagged=%i)", changed,
                 static_cast<unsigned>(entries.size()), read, flagged);
     if (SyncPlanner* planner = SyncPlanner::current()) planner->autoSyncSoon();

@@ -5,6 +5,8 @@
 
 #include <gtest/gtest.h>
 
+#include <cstdlib>
+#include <numeric>
 #include <vector>
 
 using namespace Foundation;
@@ -18,6 +20,15 @@ class IPCRoutine : public AgentFixture {
     using Rows = std::span<const std::int64_t>;
 
     IPCRoutine() : mPort(port()) {}
+
+    /// Changes the file, before the agent has been started.
+    void write(const std::string& statements) const {
+        ASSERT_EQ(agent(), 0);
+        SQLite::Database writer;
+        writer.open(path.c_str(), true);
+        writer.execute("%s", statements.c_str());
+        writer.close(true);
+    }
 
     template <class Routine, class... Arguments>
     std::int32_t call(const Routine& routine, Arguments&&... arguments) {
@@ -155,8 +166,12 @@ TEST_F(IPCRoutine, SubscriptionSettersSetTheirColumns) {
 }
 
 TEST_F(IPCRoutine, FeedRefreshGivesADomainAtMost) {
+    write("insert into Feeds (rowID,url,identifier) values (3,'gopher://example.org/3','f3')");
     std::int64_t domain = -1;
     EXPECT_EQ(call(RPC::ipc_feed_refresh, 1, true, domain), 0);
+    EXPECT_EQ(domain, 0);
+    EXPECT_EQ(call(RPC::ipc_feed_refresh, 3, true, domain), 0);
+    EXPECT_EQ(domain, NetError::kPFURL) << "it could not be started";
     EXPECT_EQ(call(RPC::ipc_feed_refresh, 9, true, domain), kBadRow);
 }
 
@@ -226,9 +241,39 @@ TEST_F(IPCRoutine, EntriesSetFlagsLeavesAloneWhatIsBelowZero) {
 TEST_F(IPCRoutine, EntriesSetFlagsChangesAllOrNone) {
     const std::vector<std::int64_t> rows = {1, 2, 99};
     EXPECT_EQ(call(RPC::ipc_entries_setflags, Rows(rows), 1, 1), kBadRow);
+    EXPECT_EQ(inFile("select count(*) from Entries where read=1 or flagged=1"), 0);
+    // Nor does what was refused come with what is accepted.
     const std::vector<std::int64_t> other = {5};
     EXPECT_EQ(call(RPC::ipc_entries_setflags, Rows(other), 1, -1), 0);
-    EXPECT_EQ(inFile("select count(*) from Entries where read=1 and rowID=5"), 1);
+    EXPECT_EQ(textInFile("select group_concat(rowID) from Entries where read=1 or flagged=1"), "5");
+    EXPECT_EQ(inFile("select unreadCount from Subscriptions where rowID=2"), 19);
+}
+
+TEST_F(IPCRoutine, EntriesSetFlagsTakesAsManyRowsAsAPeerMaySend) {
+    const std::vector<std::int64_t> rows(RPC::kMaximumRowIDs, 1);
+    EXPECT_EQ(call(RPC::ipc_entries_setflags, Rows(rows), 1, 1), 0);
+    EXPECT_EQ(inFile("select count(*) from Entries where read=1 and flagged=1"), 1);
+    EXPECT_EQ(inFile("select unreadCount from Subscriptions where rowID=2"), 19);
+}
+
+TEST_F(IPCRoutine, EntriesSetFlagsCountsALongFeedOnce) {
+    const int count = std::getenv("ORVANE_SLOW_TESTS") ? 100'000 : 5'000;
+    write(
+        OVFormat("with recursive n(i) as (select 21 union all select i+1 from n where i<%d)"
+                 " insert into Entries (rowID,identifier,feed,current,read,flagged,"
+                 "localDateCreated) select i,'e'||i,1,1,0,0,1000 from n",
+                 count));
+    std::vector<std::int64_t> rows(static_cast<std::size_t>(count));
+    std::iota(rows.begin(), rows.end(), 1);
+    EXPECT_EQ(call(RPC::ipc_entries_setflags, Rows(rows), 1, 1), 0);
+    EXPECT_EQ(inFile("select count(*) from Entries where read=1 and flagged=1"), count);
+    EXPECT_EQ(inFile("select unreadCount from Subscriptions where rowID=2"), 0);
+}
+
+TEST_F(IPCRoutine, WhatCannotBeSavedIsAnError) {
+    write("create trigger refuse before update on Entries begin select raise(abort, 'no'); end");
+    EXPECT_EQ(call(RPC::ipc_entry_setFlagged, 1, true), kFailed);
+    EXPECT_EQ(inFile("select flagged from Entries where rowID=1"), 0);
 }
 
 TEST_F(IPCRoutine, EnclosureActionTakesAnyNumber) {
