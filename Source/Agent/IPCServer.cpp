@@ -51,8 +51,7 @@ IPCServer& IPCServer::instance() {
 bool IPCServer::startServer() {
     const int port = LaunchListener::instance()->getMachServerPort(RPC::kServiceName);
     if (port != 0) gLogIPC.log("IPCServer: Got port %i from svcd", port);
-    const bool isRegistered =
-        port != 0 ? Bus::user().requestName(RPC::kServiceName) : registerName();
+    const bool isRegistered = registerName(port == 0);
     // Whoever has the name answers to it.
     if (!isRegistered && Bus::user().isConnected()) return false;
     instance().listen();
@@ -60,11 +59,13 @@ bool IPCServer::startServer() {
     return isRegistered;
 }
 
-bool IPCServer::registerName() {
+bool IPCServer::registerName(bool isLogged) {
     Bus& bus = Bus::user();
     if (bus.requestName(RPC::kServiceName)) {
-        gLogIPC.log("IPCServer: allocated and registered Mach port %i",
-                    numberOf(bus.getUniqueName()));
+        if (isLogged) {
+            gLogIPC.log("IPCServer: allocated and registered Mach port %i",
+                        numberOf(bus.getUniqueName()));
+        }
         return true;
     }
     if (bus.isConnected()) {
@@ -116,7 +117,7 @@ void IPCServer::serve(BusMessage& request) {
     const std::string interface = request.getInterface();
     if (isIntrospection(request)) {
         BusMessage reply = request.newReply();
-        send(request, reply.append(RPC::describeObject()));
+        _send(request, reply.append(RPC::describeObject()));
     } else if (!interface.empty() && interface != RPC::kInterface) {
         refuse(request, "UnknownInterface", "There is no such interface");
     } else {
@@ -135,13 +136,13 @@ void IPCServer::callRoutine(BusMessage& request) {
     const bool isGood = stub(request, reply);
     mCaller.clear();
     if (isGood) {
-        send(request, reply);
+        _send(request, reply);
     } else {
         refuse(request, "InvalidArgs", "The arguments are not those of " + name);
     }
 }
 
-void IPCServer::send(const BusMessage& request, BusMessage& reply) {
+void IPCServer::_send(const BusMessage& request, BusMessage& reply) {
     if (Bus::user().send(reply) || reply.isValid()) return;
     std::fprintf(stderr, "%d: badly generated MIG reply for port %x\n", EINVAL,
                  static_cast<unsigned>(numberOf(request.getSender())));

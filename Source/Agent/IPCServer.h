@@ -19,6 +19,8 @@ namespace Orvane {
 /// their routine, see `OVMIGRoutineWrapper`.
 class IPCServer : Foundation::RunLoopSource {
  public:
+    using BusMessage = Foundation::BusMessage;
+
     /// Posted in the local centre, with the empty string, for every request that names a routine.
     static constexpr const Foundation::NotificationName& kCallHandledNotification =
         Foundation::NotificationNames::kCallHandled;
@@ -29,13 +31,14 @@ class IPCServer : Foundation::RunLoopSource {
     /// The unique name, on the bus, of who called the routine that runs; empty outside of one.
     static std::string getCaller();
 
- private:
-    using BusMessage = Foundation::BusMessage;
+    /// Sends a reply. One that could not be put together is dropped, and the standard error told.
+    static void _send(const BusMessage& request, BusMessage& reply);
 
+ private:
     IPCServer() = default;
 
     static IPCServer& instance();
-    static bool registerName();
+    static bool registerName(bool isLogged);
     void listen();
     static void noteOwner(const std::string& owner);
 
@@ -44,7 +47,6 @@ class IPCServer : Foundation::RunLoopSource {
 
     void serve(BusMessage& request);
     void callRoutine(BusMessage& request);
-    void send(const BusMessage& request, BusMessage& reply);
 
     Foundation::BusSubscriptionPtr mObject;
     Foundation::BusSubscriptionPtr mNameWatch;

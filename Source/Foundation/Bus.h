@@ -132,12 +132,15 @@ class Bus : RunLoopSource {
     /// The owner of a watched name as of the message that is being delivered, which `getNameOwner`
     /// may be ahead of.
     std::string getWatchedOwner(const std::string& name) const;
+    /// Whether the owner of a watched name is told: there is a connection, and the bus has agreed.
+    bool isWatching(const std::string& name) const;
 
  private:
     friend class BusSubscription;
     struct Subscription;
     struct WatchedName {
         int users = 0;
+        bool isTold = false;  ///< the bus has agreed
         std::string owner;
     };
     using Subscriptions = std::map<int, std::shared_ptr<Subscription>>;

@@ -89,6 +89,11 @@ std::string Bus::getWatchedOwner(const std::string& name) const {
     return found == mWatched.end() ? std::string() : found->second.owner;
 }
 
+bool Bus::isWatching(const std::string& name) const {
+    const auto found = mWatched.find(name);
+    return isConnected() && found != mWatched.end() && found->second.isTold;
+}
+
 void Bus::beginWatch(const std::string& name) {
     const bool wasConnected = isConnected();
     WatchedName& watched = mWatched[name];
@@ -110,7 +115,7 @@ void Bus::endWatch(const std::string& name) {
 void Bus::findOwner(const std::string& name, WatchedName& watched) {
     // In this order, so that no change falls between. One that comes before the answer is taken in
     // after it, and leads to the owner that the answer names or past it.
-    askFor(ownerChanges(name).getRule());
+    watched.isTold = askFor(ownerChanges(name).getRule());
     watched.owner = getNameOwner(name);
 }
 

@@ -197,6 +197,22 @@ TEST_F(BusTest, TellsOfEveryNameWhenAskedForNone) {
     EXPECT_EQ(changes, 4);
 }
 
+TEST_F(BusTest, KnowsWhetherTheBusTellsOfOwners) {
+    LogCapture log;
+    EXPECT_FALSE(bus.isWatching(kName));
+    auto watch = bus.watchName(kName, nullptr);
+    EXPECT_TRUE(bus.isWatching(kName));
+    watch = nullptr;
+    EXPECT_FALSE(bus.isWatching(kName));
+    daemon.die();
+    bus.close();
+    daemon.start("<limit name=\"max_match_rules_per_connection\">0</limit>");
+    watch = bus.watchName(kName, nullptr);
+    EXPECT_TRUE(bus.isConnected());
+    EXPECT_FALSE(bus.isWatching(kName));
+    EXPECT_EQ(log.count("Can't ask the user's message bus for signals ("), 1);
+}
+
 TEST_F(BusTest, AnswersCallsWithAnErrorInsteadOfLettingThemWait) {
     Peer peer(daemon);
     const BusMessage reply = bus.callMethod(

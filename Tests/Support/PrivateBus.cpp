@@ -14,6 +14,18 @@ extern char** environ;
 
 namespace Support {
 
+namespace {
+
+/// What a session's bus is, but for its limits. It listens at the address that it is given.
+constexpr const char* kBegin =
+    "<busconfig><type>session</type><listen>unix:tmpdir=/tmp</listen>"
+    "<auth>EXTERNAL</auth><standard_session_servicedirs/>"
+    "<policy context=\"default\"><allow send_destination=\"*\" eavesdrop=\"true\"/>"
+    "<allow eavesdrop=\"true\"/><allow own=\"*\"/></policy>";
+constexpr const char* kEnd = "</busconfig>\n";
+
+}  // namespace
+
 PrivateBus::PrivateBus() : mAddress("unix:path=" + (mDirectory / "bus")) {
     start();
     mVariable.emplace("DBUS_SESSION_BUS_ADDRESS", mAddress.c_str());
@@ -25,13 +37,17 @@ PrivateBus::~PrivateBus() {
     if (mPID > 0) die();
 }
 
-void PrivateBus::start() {
+void PrivateBus::start(const std::string& limits) {
     int fds[2];
     if (pipe2(fds, O_CLOEXEC) != 0) throw std::runtime_error("pipe2");
     unlink((mDirectory / "bus").c_str());
+    mDirectory.writeFile("bus.conf", std::string(kBegin) + limits + kEnd);
+    const std::string configuration = "--config-file=" + (mDirectory / "bus.conf");
     const std::string listen = "--address=" + mAddress;
-    const char* arguments[] = {"dbus-daemon",  "--session",         "--nofork", "--nosyslog",
-                               listen.c_str(), "--print-address=3", nullptr};
+    const char* arguments[] = {"dbus-daemon",  limits.empty() ? "--session" : configuration.c_str(),
+                               "--nofork",     "--nosyslog",
+                               listen.c_str(), "--print-address=3",
+                               nullptr};
     posix_spawn_file_actions_t actions;
     posix_spawn_file_actions_init(&actions);
     posix_spawn_file_actions_adddup2(&actions, fds[1], 3);

@@ -25,8 +25,9 @@ class PrivateBus {
     void resume();
     /// Ends it at once, as a crash would.
     void die();
-    /// Starts it again at the same address.
-    void start();
+    /// Starts it again at the same address. `limits` are elements of its configuration (dbus-daemon
+    /// manual, "limit"), without which it has those of a session.
+    void start(const std::string& limits = {});
 
  private:
     TempDir mDirectory;

@@ -16,6 +16,8 @@ namespace MachError = Foundation::MachError;
 namespace {
 
 constexpr const char* kErrorPrefix = "org.freedesktop.DBus.Error.";
+/// Of what the service manager says where it is to start the agent.
+constexpr const char* kManagerPrefix = "org.freedesktop.systemd1.";
 
 double timeoutSeconds() {
     return gOrvaneIPCTimeoutMS / 1000.0;
@@ -34,6 +36,10 @@ void AgentService::watch() {
     mWatch = Bus::user().watchName(
         kServiceName, [this](const std::string&, const std::string& oldOwner,
                              const std::string& newOwner) { ownerChanged(oldOwner, newOwner); });
+}
+
+bool AgentService::isWatching() const {
+    return Bus::user().isWatching(kServiceName);
 }
 
 std::int32_t AgentService::lookUp(std::uint32_t& port) {
@@ -88,6 +94,7 @@ std::int32_t AgentService::send(std::uint32_t port, BusMessage& request, BusMess
 std::int32_t AgentService::statusOf(const BusMessage& reply, bool mayStart) const {
     std::string name = reply.getErrorName();
     gLogIPC.log("AgentService: %s: %s", name, reply.getErrorText());
+    if (name.starts_with(kManagerPrefix)) return MachError::kUnknownService;
     if (!name.starts_with(kErrorPrefix)) return MachError::kServerDied;
     name.erase(0, std::string_view(kErrorPrefix).size());
     if (name == "NameHasNoOwner" || name == "ServiceUnknown") {

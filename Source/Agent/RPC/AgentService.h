@@ -42,8 +42,8 @@ class AgentService : Foundation::Uncopyable {
     /// is no bus.
     std::int32_t lookUp(std::uint32_t& port);
     void setDeathHandler(DeathHandler handler) { mDeathHandler = std::move(handler); }
-    /// Whether the end of the agent will be noticed.
-    bool isWatching() const { return Foundation::Bus::user().isConnected() && mWatch; }
+    /// Whether the end of the agent will be noticed. Not so if the bus refuses to tell.
+    bool isWatching() const;
 
     /// A request without arguments, for `send`.
     BusMessage newRequest(std::uint32_t port, const char* routine);

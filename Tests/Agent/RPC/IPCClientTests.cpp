@@ -18,8 +18,12 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
+#include <chrono>
 #include <csignal>
 #include <filesystem>
+#include <memory>
+#include <thread>
 
 using namespace Foundation;
 using namespace Orvane;
@@ -34,6 +38,45 @@ class IPCClientTest : public AgentFixture {
  protected:
     static EntryCore* entry(SQLite::RowID rowID) { return EntryCore::getRow(rowID); }
     static ClientCore* reader() { return ClientCore::getRow(1); }
+    /// Has the bus know no program for the agent's name any more.
+    void withoutService() const {
+        std::filesystem::remove_all(base.path() / "dbus-1");
+        Bus::user().callMethod({"org.freedesktop.DBus", "/org/freedesktop/DBus",
+                                "org.freedesktop.DBus", "ReloadConfig"});
+    }
+};
+
+/// Has the agent's name, and answers the first call with an error.
+class Refuser {
+ public:
+    Refuser(const Support::PrivateBus& bus, const char* error) {
+        std::string text;
+        mConnection = BusConnection::open(bus.getAddress(), text);
+        BusMessage request = mConnection->newCall({"org.freedesktop.DBus", "/org/freedesktop/DBus",
+                                                   "org.freedesktop.DBus", "RequestName"});
+        request.append(RPC::kServiceName).append(std::uint32_t{4});
+        EXPECT_TRUE(mConnection->call(request, 30).isValid());
+        mThread = std::thread([this, error] { refuse(error); });
+    }
+    ~Refuser() { mThread.join(); }
+    Refuser(const Refuser&) = delete;
+    Refuser& operator=(const Refuser&) = delete;
+
+ private:
+    void refuse(const char* error) const {
+        using std::chrono::steady_clock;
+        const auto end = steady_clock::now() + std::chrono::seconds(30);
+        for (BusConnection::Messages messages; steady_clock::now() < end; messages.clear()) {
+            mConnection->pump(1, messages);
+            if (messages.empty() || !messages[0].isCall()) continue;
+            BusConnection::replyError(messages[0], error, "refused");
+            mConnection->flush(30, messages);
+            return;
+        }
+    }
+
+    std::unique_ptr<BusConnection> mConnection;
+    std::thread mThread;
 };
 
 /// How often the death of an agent has been posted.
@@ -199,16 +242,22 @@ TEST_F(IPCClientTest, ThrowsWhatTheAgentAnswers) {
     writer.execute("delete from Entries where rowID=5");
     writer.close(true);
     EXPECT_EQ(errorOf([&] { row->public_setRead(true); }), NetError(1002, 200));
-    EXPECT_TRUE(log.contains("IPC call returned OVInvalidRowIDError (1002,200) (Mach error "));
+    EXPECT_TRUE(
+        log.contains("IPC call returned OVInvalidRowIDError (1002,200) (Mach error f8fa80c8)"));
 }
 
 TEST_F(IPCClientTest, WarnsOfACallWithinATransactionAndMakesIt) {
+    const Support::EnvVar withStack("OVPrintStack", "1");
     openSession();
     const Ref<EntryCore> row = entry(1);
+    testing::internal::CaptureStderr();
     {
         const SQLite::Transaction transaction(false);
         EXPECT_TRUE(row->public_setRead(true));
     }
+    const std::string stack = testing::internal::GetCapturedStderr();
+    EXPECT_EQ(std::count(stack.begin(), stack.end(), '\n'), 11) << stack;
+    EXPECT_TRUE(stack.ends_with("\t...more...\n"));
     EXPECT_EQ(log.count("*** DANGER: Calling agent while in db transaction -- likely to deadlock "
                         "***"),
               1);
@@ -229,6 +278,52 @@ TEST_F(IPCClientTest, LogsItsCallsWithTheTimeThatTheyTook) {
     EXPECT_EQ(gLogIPC.mIndentation, 0u);
 }
 
+TEST_F(IPCClientTest, LogsWhereItFindsTheAgentAndThatThatDies) {
+    const Support::LoggingOn on({&gLogIPC});
+    client().startSkerrySync();
+    log.clear();
+    client().lookupServerPort();
+    const std::uint32_t found = client().getServerPort();
+    EXPECT_TRUE(log.contains("[IPC] Looking up the agent's Mach port"));
+    EXPECT_TRUE(log.contains(OVFormat("[IPC] Got agent Mach port: %u", found)));
+    killAgent();
+    constexpr const char* kDied = "[IPC] Agent's Mach port died -- presumably Agent died too";
+    ASSERT_TRUE(turnUntil([&] { return log.contains(kDied); }));
+    log.clear();
+    client().startSkerrySync();
+    EXPECT_GT(client().getServerPort(), found) << "no port comes to mean another agent";
+}
+
+TEST_F(IPCClientTest, CallsEvenIfTheBusTellsOfNoDeath) {
+    client();
+    bus.die();
+    Bus::user().close();
+    RPC::AgentService::instance()._forget();
+    bus.start("<limit name=\"max_match_rules_per_connection\">0</limit>");
+    client().lookupServerPort();
+    EXPECT_EQ(log.count("IPCClient: mach_port_request_notification returned server died (11,-308)"),
+              1);
+    client().startSkerrySync();
+    killAgent();
+    client().startSkerrySync();
+    EXPECT_GT(agent(), 0);
+}
+
+TEST_F(IPCClientTest, IsMadeWhereThereIsNoAgentToBeHad) {
+    struct Connection : IPCConnection {};
+    withoutService();
+    const Connection connection;
+    EXPECT_EQ(connection.getServerPort(), 0u);
+    EXPECT_EQ(log.count("caught in Orvane::IPCClient::IPCClient()"), 1);
+}
+
+TEST_F(IPCClientTest, CannotLaunchWhatTheServiceManagerRefuses) {
+    client().lookupServerPort();
+    // Where the bus has the service manager start the agent, it hands on what that says.
+    Refuser manager(bus, "org.freedesktop.systemd1.UnitMasked");
+    EXPECT_EQ(errorOf([] { client().startSkerrySync(); }), kLaunch);
+}
+
 TEST_F(IPCClientTest, GivesARepairTwoMinutesAndOthersHalfAMinute) {
     setProgram("/bin/false");
     const Support::LoggingOn on({&gLogIPC});
@@ -244,9 +339,7 @@ TEST_F(IPCClientTest, GivesARepairTwoMinutesAndOthersHalfAMinute) {
 }
 
 TEST_F(IPCClientTest, CannotLaunchWhatNobodyKnows) {
-    std::filesystem::remove_all(base.path() / "dbus-1");
-    Bus::user().callMethod(
-        {"org.freedesktop.DBus", "/org/freedesktop/DBus", "org.freedesktop.DBus", "ReloadConfig"});
+    withoutService();
     EXPECT_EQ(errorOf([] { client().lookupServerPort(); }), kLaunch);
     EXPECT_EQ(client().getServerPort(), 0u);
     EXPECT_FALSE(client().listenForAgentDeath());

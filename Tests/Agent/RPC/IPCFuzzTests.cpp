@@ -129,7 +129,7 @@ TEST_F(IPCFuzz, LeavesTheAgentRunningAndItsMemoryFlat) {
     for (int i = 0; i < count; ++i) {
         // What it keeps for good, such as prepared statements and rows, is there after a while.
         if (i == count / 2) before = residentKB(running);
-        send(*routines[static_cast<std::size_t>(below(static_cast<int>(routines.size())))]);
+        send(*routines[static_cast<std::size_t>(i) % routines.size()]);
     }
     ASSERT_EQ(agent(), running);
     client().startSkerrySync();
