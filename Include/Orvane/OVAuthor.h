@@ -57,7 +57,7 @@ class OV_EXPORT OVAuthor : public OVObject {
     OVAuthorInternal& _internal() const { return *mInternal; }
 
  private:
-    friend class OVAuthorInternal;
+    friend class OVObjectMaker;
     explicit OVAuthor(std::unique_ptr<OVAuthorInternal> internal);
 
     std::unique_ptr<OVAuthorInternal> mInternal;

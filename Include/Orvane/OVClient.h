@@ -146,7 +146,7 @@ class OV_EXPORT OVClient : public OVObject {
     OVClientInternal& _internal() const { return *mInternal; }
 
  private:
-    friend class OVClientInternal;
+    friend class OVObjectMaker;
     explicit OVClient(std::unique_ptr<OVClientInternal> internal);
 
     std::unique_ptr<OVClientInternal> mInternal;

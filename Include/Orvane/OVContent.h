@@ -46,7 +46,7 @@ class OV_EXPORT OVContent : public OVObject {
     OVContentInternal& _internal() const { return *mInternal; }
 
  private:
-    friend class OVContentInternal;
+    friend class OVObjectMaker;
     explicit OVContent(std::unique_ptr<OVContentInternal> internal);
 
     std::unique_ptr<OVContentInternal> mInternal;

@@ -80,7 +80,7 @@ class OV_EXPORT OVEnclosure : public OVObject {
     OVEnclosureInternal& _internal() const { return *mInternal; }
 
  private:
-    friend class OVEnclosureInternal;
+    friend class OVObjectMaker;
     explicit OVEnclosure(std::unique_ptr<OVEnclosureInternal> internal);
 
     std::unique_ptr<OVEnclosureInternal> mInternal;

@@ -130,7 +130,7 @@ class OV_EXPORT OVEntry : public OVObject {
     OVEntryInternal& _internal() const { return *mInternal; }
 
  private:
-    friend class OVEntryInternal;
+    friend class OVObjectMaker;
     explicit OVEntry(std::unique_ptr<OVEntryInternal> internal);
 
     std::unique_ptr<OVEntryInternal> mInternal;

@@ -137,7 +137,7 @@ class OV_EXPORT OVFeed : public OVObject {
     OVFeedInternal& _internal() const { return *mInternal; }
 
  private:
-    friend class OVFeedInternal;
+    friend class OVObjectMaker;
     explicit OVFeed(std::unique_ptr<OVFeedInternal> internal);
 
     std::unique_ptr<OVFeedInternal> mInternal;

@@ -2,6 +2,7 @@
 
 #include "Bridges/Barriers.h"
 #include "Bridges/OVAuthorInternal.h"
+#include "Bridges/OVObjectMaker.h"
 #include "Bridges/PublicSession.h"
 #include "Bridges/PublicValues.h"
 
@@ -22,7 +23,7 @@ std::shared_ptr<OVAuthor> OVAuthor::create(const Text& name, const Text& email, 
         core->mName.setValue(stringOf(name).get());
         core->mEmail.setValue(stringOf(email).get());
         core->mURL.setValue(urlOf(URL).get());
-        return OVAuthorInternal::make(core.get());
+        return OVObjectMaker::makeFor<OVAuthor, OVAuthorInternal>(core.get());
     });
 }
 

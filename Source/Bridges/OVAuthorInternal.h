@@ -10,9 +10,6 @@
 /// The state of an `OVAuthor`.
 class OVAuthorInternal : public OVInternal {
  public:
-    /// The public object of a row that has none.
-    static std::shared_ptr<OVAuthor> make(Orvane::AuthorCore* core);
-
     /// The row, for use: see `OVInternal::useCore`.
     Orvane::AuthorCore& core() const { return static_cast<Orvane::AuthorCore&>(useCore()); }
     /// The same to look at; null only while the object is made.

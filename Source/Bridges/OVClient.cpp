@@ -1,9 +1,10 @@
 #include <Orvane/OVClient.h>
 
 #include "Bridges/Barriers.h"
+#include "Bridges/ClientDelegates.h"
 #include "Bridges/FeedSettings.h"
 #include "Bridges/OVClientInternal.h"
-#include "Bridges/PublicObjectFactory.h"
+#include "Bridges/PublicObject.h"
 #include "Bridges/PublicSession.h"
 #include "Bridges/PublicValues.h"
 #include "Foundation/ApplicationIdentity.h"
@@ -138,11 +139,11 @@ void OVClient::setSettings(const std::optional<OVFeedSettings>& settings) {
 }
 
 OVClientDelegate* OVClient::delegate() const {
-    return mInternal->delegate;
+    return ClientDelegates::get(this);
 }
 
 void OVClient::setDelegate(OVClientDelegate* delegate) {
-    mInternal->delegate = delegate;
+    ClientDelegates::set(this, delegate);
 }
 
 std::optional<OVDate> OVClient::dateLastUpdated() const {

@@ -1,10 +1,11 @@
 #include "Bridges/OVClientInternal.h"
 
 #include "Bridges/Barriers.h"
+#include "Bridges/ClientDelegates.h"
 #include "Bridges/OVEnclosureInternal.h"
 #include "Bridges/OVEntryInternal.h"
 #include "Bridges/OVFeedInternal.h"
-#include "Bridges/PublicObjectFactory.h"
+#include "Bridges/PublicObject.h"
 #include "Bridges/PublicValues.h"
 #include "Foundation/DistributedNotificationCenter.h"
 #include "Foundation/Guard.h"
@@ -55,20 +56,17 @@ OVClientInternal::OVClientInternal() {
 OVClientInternal::~OVClientInternal() {
     callGuarded("OVClientInternal::~OVClientInternal()", [this] {
         stopObserving();
+        ClientDelegates::set(getOwner(), nullptr);
         dateLastUpdated = nullptr;
     });
 }
 
-std::shared_ptr<OVClient> OVClientInternal::_initWithCore(ClientCore* core) {
-    auto internal = std::make_unique<OVClientInternal>();
-    OVClientInternal& state = *internal;
-    std::shared_ptr<OVClient> made(new OVClient(std::move(internal)));
-    state.mSignature = textOf(core->mSignature.getValue()).value_or("");
-    state.setCore(core, made.get());
-    gLogAPIVerbose.log("INIT %@", made.get());
-    state.observe();
-    state.mRefreshTimer.start(kRefreshDelaySeconds, false);
-    return made;
+void OVClientInternal::_initWithCore(ClientCore* core, OVObject* owner) {
+    mSignature = textOf(core->mSignature.getValue()).value_or("");
+    setCore(core, owner);
+    gLogAPIVerbose.log("INIT %@", owner);
+    observe();
+    mRefreshTimer.start(kRefreshDelaySeconds, false);
 }
 
 std::shared_ptr<OVClient>& OVClientInternal::applicationClient() {
@@ -106,27 +104,6 @@ Ref<Core> OVClientInternal::findAgain() {
     const Ref<String> signature = stringOf(mSignature);
     const Ref<ClientCore> again = ClientCore::existingClientWithSignature(signature.get());
     return Ref<Core>(again);
-}
-
-// The application's delegate.
-
-std::shared_ptr<OVFeed> OVClientInternal::feedOf(const OVFeedInternal& internal) {
-    return internal.self();
-}
-
-OVClientDelegate* OVClientInternal::delegateOf(const OVFeedInternal& feed,
-                                               std::shared_ptr<OVClient>& client) {
-    const SubscriptionCore* subscription = feed._subscriptionCore();
-    const ClientCore* core = subscription ? subscription->getClient() : nullptr;
-    // An object that is not there has no delegate.
-    OVObject* object = core ? core->getExistingOVObject() : nullptr;
-    if (!object) return nullptr;
-    client = std::static_pointer_cast<OVClient>(object->weak_from_this().lock());
-    return client ? client->delegate() : nullptr;
-}
-
-void OVClientInternal::reportDelegate(const char* text) {
-    gWarn.log("Exception notifying OVClient delegate: %s", text);
 }
 
 // What is announced in this process, and by the agent. Handled in the loop's next turn: all of one
@@ -270,7 +247,7 @@ void remember(const UpdatedEntryIterator& each, const Date* since, OVFeedInterna
     const Date* created = each.getEntry()->mLocalDateCreated.getValue();
     if (each.hasExpired()) {
         // For the application that is the same as being gone.
-        feed._rememberDeletedEntry(entry);
+        feed._rememberDeletedEntry(entry->identifier().value_or(""));
     } else if (created && (!since || created->compare(*since) > 0)) {
         feed._rememberAddedEntry(entry);
     } else {

@@ -10,13 +10,10 @@
 
 #include <Orvane/OVClient.h>
 
-#include <exception>
 #include <memory>
 #include <string>
 #include <string_view>
 #include <vector>
-
-class OVFeedInternal;
 
 /// The state of an `OVClient`: what it hears of, and what it tells.
 class OVClientInternal : public OVInternal {
@@ -26,8 +23,8 @@ class OVClientInternal : public OVInternal {
     OVClientInternal();
     ~OVClientInternal() override;
 
-    /// The public object of a row that has none. It begins to listen.
-    static std::shared_ptr<OVClient> _initWithCore(Orvane::ClientCore* core);
+    /// Makes the object stand for a row. It begins to listen.
+    void _initWithCore(Orvane::ClientCore* core, OVObject* owner);
 
     /// The application's own, which is kept here; null before the first use.
     static std::shared_ptr<OVClient>& applicationClient();
@@ -42,11 +39,6 @@ class OVClientInternal : public OVInternal {
     /// See `OVClient`.
     void sendChangesSinceDate(Foundation::Date* date);
 
-    /// Calls the delegate of a feed's client, if there is one. What it throws is reported.
-    template <class Call>
-    static void tellDelegateOf(const OVFeedInternal& feed, Call call);
-
-    OVClientDelegate* delegate = nullptr;
     Foundation::Ref<Foundation::Date> dateLastUpdated;
     bool tracksEntryChanges = true;
 
@@ -74,10 +66,6 @@ class OVClientInternal : public OVInternal {
     void _handleDownloadNotification(const std::vector<std::string_view>& parts, bool reload);
 
     Foundation::Ref<Foundation::Date> collectChanges(Foundation::Date* since, Feeds& feeds);
-    static std::shared_ptr<OVFeed> feedOf(const OVFeedInternal& internal);
-    static OVClientDelegate* delegateOf(const OVFeedInternal& feed,
-                                        std::shared_ptr<OVClient>& client);
-    static void reportDelegate(const char* text);
 
     std::string mSignature;  ///< by which the client is found again
     Receiver mTableObserver{this, &OVClientInternal::tableChanged};
@@ -87,17 +75,3 @@ class OVClientInternal : public OVInternal {
     Timer mSubscriptionsTimer{this, &OVClientInternal::handleSubscriptions};
     std::vector<Foundation::Ref<Foundation::Dictionary>> mSubscriptionChanges;  ///< still to handle
 };
-
-template <class Call>
-void OVClientInternal::tellDelegateOf(const OVFeedInternal& feed, Call call) {
-    std::shared_ptr<OVClient> client;
-    OVClientDelegate* delegate = delegateOf(feed, client);
-    if (!delegate) return;
-    try {
-        call(*delegate, feedOf(feed));
-    } catch (const std::exception& exception) {
-        reportDelegate(exception.what());
-    } catch (...) {
-        reportDelegate("of an unknown kind");
-    }
-}

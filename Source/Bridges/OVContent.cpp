@@ -2,6 +2,7 @@
 
 #include "Bridges/Barriers.h"
 #include "Bridges/OVContentInternal.h"
+#include "Bridges/OVObjectMaker.h"
 #include "Bridges/PublicValues.h"
 #include "Foundation/MIMEType.h"
 #include "Utilities/XMLElement.h"
@@ -18,7 +19,7 @@ std::shared_ptr<OVContent> makeContent(std::string_view bytes, const Ref<String>
     const Ref<Data> data = Data::data(bytes.data(), bytes.size());
     core->mData.setValue(data.get());
     core->mMIMEType.setValue(type.get());
-    return OVContentInternal::make(core.get());
+    return OVObjectMaker::makeFor<OVContent, OVContentInternal>(core.get());
 }
 
 /// The text of HTML; the HTML itself if it cannot be read.

@@ -11,9 +11,6 @@
 /// The state of an `OVContent`.
 class OVContentInternal : public OVInternal {
  public:
-    /// The public object of a row that has none.
-    static std::shared_ptr<OVContent> make(Orvane::ContentCore* core);
-
     /// The row, for use: see `OVInternal::useCore`.
     Orvane::ContentCore& core() const { return static_cast<Orvane::ContentCore&>(useCore()); }
     /// The same to look at; null only while the object is made.

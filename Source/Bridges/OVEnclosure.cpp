@@ -4,7 +4,8 @@
 #include "Bridges/FileTypes.h"
 #include "Bridges/OVEnclosureInternal.h"
 #include "Bridges/OVEntryInternal.h"
-#include "Bridges/PublicObjectFactory.h"
+#include "Bridges/OVObjectMaker.h"
+#include "Bridges/PublicObject.h"
 #include "Bridges/PublicValues.h"
 #include "Model/EntryCore.h"
 #include "Utilities/FileUtils.h"
@@ -25,7 +26,7 @@ std::shared_ptr<OVEnclosure> makeEnclosure(const Ref<URL>& url, const Ref<String
     core->mURL.setValue(url.get());
     core->mMIMEType.setValue(type.get());
     core->mLength.setValue(length);
-    return OVEnclosureInternal::make(core.get());
+    return OVObjectMaker::makeFor<OVEnclosure, OVEnclosureInternal>(core.get());
 }
 
 /// The type that the name of a file stands for; null if it stands for none.

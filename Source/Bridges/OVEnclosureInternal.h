@@ -12,9 +12,6 @@ class OVClient;
 /// The state of an `OVEnclosure`.
 class OVEnclosureInternal : public OVInternal {
  public:
-    /// The public object of a row that has none.
-    static std::shared_ptr<OVEnclosure> make(Orvane::EnclosureCore* core);
-
     /// The row, for use: see `OVInternal::useCore`.
     Orvane::EnclosureCore& core() const { return static_cast<Orvane::EnclosureCore&>(useCore()); }
     /// The same to look at; null only while the object is made.

@@ -4,7 +4,7 @@
 #include "Bridges/OVEnclosureInternal.h"
 #include "Bridges/OVEntryInternal.h"
 #include "Bridges/OVXMLElementTree.h"
-#include "Bridges/PublicObjectFactory.h"
+#include "Bridges/PublicObject.h"
 #include "Bridges/PublicValues.h"
 #include "Bridges/RowBatches.h"
 #include "Foundation/MutableString.h"

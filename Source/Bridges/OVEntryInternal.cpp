@@ -2,7 +2,7 @@
 
 #include "Bridges/OVClientInternal.h"
 #include "Bridges/OVFeedInternal.h"
-#include "Bridges/PublicObjectFactory.h"
+#include "Bridges/PublicObject.h"
 #include "Foundation/AssertionFailure.h"
 #include "Foundation/Logger.h"
 #include "Model/ClientCore.h"
@@ -11,14 +11,6 @@
 
 using namespace Foundation;
 using namespace Orvane;
-
-std::shared_ptr<OVEntry> OVEntryInternal::make(EntryCore* core) {
-    auto internal = std::make_unique<OVEntryInternal>();
-    OVEntryInternal& state = *internal;
-    std::shared_ptr<OVEntry> made(new OVEntry(std::move(internal)));
-    state.setCore(core, made.get());
-    return made;
-}
 
 /// Whether a feed is not the one any more that the entry was found by, because its subscription has
 /// ended.

@@ -14,9 +14,6 @@ class OVFeed;
 /// The state of an `OVEntry`.
 class OVEntryInternal : public OVInternal {
  public:
-    /// The public object of a row that has none.
-    static std::shared_ptr<OVEntry> make(Orvane::EntryCore* core);
-
     /// The row, for use: see `OVInternal::useCore`.
     Orvane::EntryCore& core() const { return static_cast<Orvane::EntryCore&>(useCore()); }
     /// The same to look at; null only while the object is made.

@@ -1,9 +1,8 @@
 #include <Orvane/OVFeed.h>
 
 #include "Bridges/Barriers.h"
-#include "Bridges/OVEntryInternal.h"
 #include "Bridges/OVFeedInternal.h"
-#include "Bridges/PublicObjectFactory.h"
+#include "Bridges/OVObjectMaker.h"
 #include "Bridges/PublicSession.h"
 #include "Bridges/PublicValues.h"
 
@@ -12,6 +11,19 @@
 
 using namespace Foundation;
 using namespace Orvane;
+
+namespace {
+
+/// Null for null.
+std::shared_ptr<OVFeed> makeInMemory(FeedCore* core) {
+    if (!core) return nullptr;
+    return OVObjectMaker::make<OVFeed, OVFeedInternal>(
+        [core](OVFeedInternal& state, OVObject* object) {
+            state._initWithFeedCore(core, nullptr, object);
+        });
+}
+
+}  // namespace
 
 OVFeed::OVFeed(std::unique_ptr<OVFeedInternal> internal) : mInternal(std::move(internal)) {}
 
@@ -23,7 +35,7 @@ std::shared_ptr<OVFeed> OVFeed::create(const std::string& url) {
     return reporting(kWhere, [&] {
         PublicSession::open();
         const Ref<FeedCore> core = FeedCore::createFeed(urlOf(url).get(), false);
-        return OVFeedInternal::_initWithFeedCore(core.get(), nullptr);
+        return makeInMemory(core.get());
     });
 }
 
@@ -34,7 +46,7 @@ std::shared_ptr<OVFeed> OVFeed::create(std::string_view data, const std::string&
         PublicSession::open();
         const Ref<Data> bytes = Data::data(data.data(), data.size());
         const Ref<FeedCore> core = FeedCore::createFeed(bytes.get(), urlOf(url).get());
-        return OVFeedInternal::_initWithFeedCore(core.get(), nullptr);
+        return makeInMemory(core.get());
     });
 }
 

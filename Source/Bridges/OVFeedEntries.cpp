@@ -2,7 +2,7 @@
 #include "Bridges/OVEntryInternal.h"
 #include "Bridges/OVFeedInternal.h"
 #include "Bridges/OVXMLElementTree.h"
-#include "Bridges/PublicObjectFactory.h"
+#include "Bridges/PublicObject.h"
 #include "Bridges/PublicValues.h"
 #include "SQLite/SQLText.h"
 

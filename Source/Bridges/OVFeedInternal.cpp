@@ -2,14 +2,8 @@
 
 #include "Bridges/Barriers.h"
 #include "Bridges/FeedSettings.h"
-#include "Bridges/OVClientInternal.h"
-#include "Bridges/PublicObjectFactory.h"
 #include "Bridges/PublicValues.h"
-#include "Foundation/AssertionFailure.h"
 #include "Foundation/Dictionary.h"
-#include "Foundation/Guard.h"
-#include "Foundation/NetException.h"
-#include "Foundation/NotificationCenter.h"
 #include "Model/AgentLink.h"
 #include "Model/ClientCore.h"
 
@@ -18,49 +12,19 @@ using namespace Orvane;
 
 // The life of a feed: subscribing, and being found again in a new database.
 
-std::shared_ptr<OVFeed> OVFeedInternal::_initWithFeedCore(FeedCore* feedCore,
-                                                          SubscriptionCore* subscriptionCore) {
-    if (!feedCore) return nullptr;
-    auto internal = std::make_unique<OVFeedInternal>();
-    OVFeedInternal& state = *internal;
-    std::shared_ptr<OVFeed> made(new OVFeed(std::move(internal)));
-    state.setOwner(made.get());
-    state.mFeedCore = feedCore;
-    state.mURL = textOf(feedCore->mURL.getValue()).value_or("");
-    if (subscriptionCore) state.adopt(subscriptionCore);
-    return made;
-}
-
-OVFeedInternal::~OVFeedInternal() {
-    callGuarded("OVFeedInternal::~OVFeedInternal()", [this] {
-        stopListening();
-        mFeedCore = nullptr;
-    });
-}
-
-FeedCore& OVFeedInternal::core() const {
-    if (isLost()) throw NetException(NetError::kOrvane, OVInvalidRowIDError);
-    return *mFeedCore;
-}
-
-SubscriptionCore* OVFeedInternal::_subscriptionCore() const {
-    return static_cast<SubscriptionCore*>(getCore());
-}
-
-std::shared_ptr<OVFeed> OVFeedInternal::self() const {
-    return std::static_pointer_cast<OVFeed>(getOwner()->shared_from_this());
-}
-
-std::shared_ptr<OVClient> OVFeedInternal::client() const {
-    const SubscriptionCore* subscription = _subscriptionCore();
-    return subscription ? publicObject<OVClient>(subscription->getClient()) : nullptr;
+void OVFeedInternal::_initWithFeedCore(FeedCore* feedCore, SubscriptionCore* subscriptionCore,
+                                       OVObject* owner) {
+    setOwner(owner);
+    setFeedCore(feedCore);
+    mURL = textOf(feedCore->mURL.getValue()).value_or("");
+    if (subscriptionCore) adopt(subscriptionCore);
 }
 
 bool OVFeedInternal::_addToClient(ClientCore& client) {
     requireParameter(!_subscriptionCore(), "-[OVFeed _addToClient:]",
                      "OVFeed already added to a OVClient");
     const Ref<Dictionary> settings = dictionaryOf(mTemporarySettings);
-    const Ref<SubscriptionCore> made = client.createSubscription(mFeedCore.get(), settings.get());
+    const Ref<SubscriptionCore> made = client.createSubscription(_feedCore(), settings.get());
     if (!made.get()) return false;
     if (made->getExistingOVObject()) {
         gLog.log("OVClient %@ can't add %@: already has a feed with that URL", &client, getOwner());
@@ -74,8 +38,8 @@ bool OVFeedInternal::_addToClient(ClientCore& client) {
 
 void OVFeedInternal::adopt(SubscriptionCore* subscription) {
     setCore(subscription, getOwner());
-    mFeedCore = subscription->getFeed();
-    mUnreadCount = -1;
+    setFeedCore(subscription->getFeed());
+    resetUnreadCount();
     const ClientCore* client = subscription->getClient();
     mClientSignature = client ? textOf(client->mSignature.getValue()).value_or("") : "";
 }
@@ -97,7 +61,7 @@ bool OVFeedInternal::_remove() {
 void OVFeedInternal::becomeUnsubscribed() {
     _endRefresh();
     setCore(nullptr, getOwner());
-    mFeedCore->unload();
+    _feedCore()->unload();
     const Ref<URL> url = urlOf(mURL);
     Ref<FeedCore> fresh = FeedCore::createFeed(url.get(), false);
     if (!fresh.get()) {
@@ -105,8 +69,8 @@ void OVFeedInternal::becomeUnsubscribed() {
         fresh = Returner<FeedCore>::adopted(new FeedCore);
         fresh->mURL.setValue(url.get());
     }
-    mFeedCore = fresh;
-    mUnreadCount = 0;
+    setFeedCore(fresh.get());
+    resetUnreadCount();
 }
 
 Ref<Core> OVFeedInternal::findAgain() {
@@ -122,7 +86,7 @@ void OVFeedInternal::foundAgain() {
     if (isLost()) {
         becomeUnsubscribed();
     } else {
-        mFeedCore = _subscriptionCore()->getFeed();
+        setFeedCore(_subscriptionCore()->getFeed());
     }
 }
 

@@ -6,6 +6,7 @@
 #include "Bridges/OVEnclosureInternal.h"
 #include "Bridges/OVEntryInternal.h"
 #include "Bridges/OVFeedInternal.h"
+#include "Bridges/OVObjectMaker.h"
 #include "Foundation/AssertionFailure.h"
 #include "Foundation/AutoreleasePool.h"
 #include "Foundation/PFRefCounted.h"
@@ -24,6 +25,14 @@ class PooledObject : public Foundation::PFRefCounted {
     std::shared_ptr<OVObject> mObject;
 };
 
+/// The object, which the current pool keeps. Null for null.
+OVObject* keepInPool(std::shared_ptr<OVObject> object) {
+    if (!object) return nullptr;
+    OVObject* const plain = object.get();
+    Foundation::AutoreleasePool::autorelease(new PooledObject(std::move(object)));
+    return plain;
+}
+
 /// The object of a row that has got one by now, or else what `make` makes.
 template <class Make>
 OVObject* madeFor(Core* row, Make make) {
@@ -34,20 +43,11 @@ OVObject* madeFor(Core* row, Make make) {
 
 }  // namespace
 
-OVObject* keepInPool(std::shared_ptr<OVObject> object) {
-    if (!object) return nullptr;
-    OVObject* const plain = object.get();
-    Foundation::AutoreleasePool::autorelease(new PooledObject(std::move(object)));
-    return plain;
-}
-
-std::shared_ptr<OVObject> publicObjectOf(Core* row) {
-    OVObject* object = Core::getOVObject(row);
-    return object ? object->shared_from_this() : nullptr;
-}
-
 OVObject* PublicObjectFactory::make(ClientCore* row) {
-    return madeFor(row, [row] { return OVClientInternal::_initWithCore(row); });
+    return madeFor(row, [row] {
+        return OVObjectMaker::make<OVClient, OVClientInternal>(
+            [row](OVClientInternal& state, OVObject* object) { state._initWithCore(row, object); });
+    });
 }
 
 OVObject* PublicObjectFactory::make(SubscriptionCore* row) {
@@ -55,24 +55,29 @@ OVObject* PublicObjectFactory::make(SubscriptionCore* row) {
         FeedCore* feed = row->getFeed();
         OV_ASSERT_MESSAGE_AS(feed != nullptr, "feed",
                              "Can't create OVFeed from client-settings SubscriptionCore");
-        return OVFeedInternal::_initWithFeedCore(feed, row);
+        return OVObjectMaker::make<OVFeed, OVFeedInternal>(
+            [=](OVFeedInternal& state, OVObject* object) {
+                state._initWithFeedCore(feed, row, object);
+            });
     });
 }
 
 OVObject* PublicObjectFactory::make(EntryCore* row) {
-    return madeFor(row, [row] { return OVEntryInternal::make(row); });
+    return madeFor(row, [row] { return OVObjectMaker::makeFor<OVEntry, OVEntryInternal>(row); });
 }
 
 OVObject* PublicObjectFactory::make(ContentCore* row) {
-    return madeFor(row, [row] { return OVContentInternal::make(row); });
+    return madeFor(row,
+                   [row] { return OVObjectMaker::makeFor<OVContent, OVContentInternal>(row); });
 }
 
 OVObject* PublicObjectFactory::make(AuthorCore* row) {
-    return madeFor(row, [row] { return OVAuthorInternal::make(row); });
+    return madeFor(row, [row] { return OVObjectMaker::makeFor<OVAuthor, OVAuthorInternal>(row); });
 }
 
 OVObject* PublicObjectFactory::make(EnclosureCore* row) {
-    return madeFor(row, [row] { return OVEnclosureInternal::make(row); });
+    return madeFor(row,
+                   [row] { return OVObjectMaker::makeFor<OVEnclosure, OVEnclosureInternal>(row); });
 }
 
 const char* PublicObjectFactory::getClassName(const OVObject* object) noexcept {

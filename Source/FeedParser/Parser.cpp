@@ -103,10 +103,6 @@ bool Parser::mayTryAgain() const {
     return mAttempt != kAttempts && !mIsOverBudget;
 }
 
-bool Parser::isLastAttempt() const {
-    return mAttempt == kAttempts - 1;
-}
-
 void Parser::attemptParse() {
     gLogParser.log("Beginning attempt #%i", mAttempt + 1);
     if (mAttempt == kTidyingAttempt && !tidyDocument()) return;
@@ -133,6 +129,7 @@ void Parser::attemptParse() {
 void Parser::clearAttempt() {
     mErrorCount = 0;
     mFatalError = false;
+    mIsLastAttempt = mAttempt == kAttempts - 1;
     mBadUTF8 = false;
     mSawFirstElement = false;
     mRawBytes = 0;

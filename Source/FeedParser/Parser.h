@@ -66,7 +66,6 @@ class Parser : Foundation::Uncopyable {
     void clearAttempt();
     bool openReader(Attempt& attempt);
     bool mayTryAgain() const;
-    bool isLastAttempt() const;
     void readDocument();
     void learnFromFirstAttempt();
     void unwind();
@@ -99,6 +98,7 @@ class Parser : Foundation::Uncopyable {
     std::int32_t mAttempt = 0;  ///< how many attempts have failed
     std::int32_t mErrorCount = 0;
     bool mFatalError = false;
+    bool mIsLastAttempt = false;
     bool mBadUTF8 = false;
     /// Lets names match with any prefix. Unlike what is noted of an attempt, this stays.
     bool mUndefinedNamespace = false;

@@ -169,7 +169,7 @@ bool Parser::readXML(Context* context, bool outer) {
     // slight, makes the attempt fail, so that imperfect documents are repaired.
     // The last attempt takes what libxml2 can recover from: nothing would be left to repair it.
     const xmlNodePtr element = xmlTextReaderExpand(mReader);
-    const bool isGood = mErrorCount == errorsBefore || (isLastAttempt() && !mFatalError);
+    const bool isGood = mErrorCount == errorsBefore || (mIsLastAttempt && !mFatalError);
     if (element && isGood && keepXML(element, context, outer)) return true;
     gLogParser.log("Fatal error: xmlTextReaderReadOuter/InnerXml failed");
     mFatalError = true;

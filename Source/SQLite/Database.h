@@ -1,13 +1,13 @@
 #pragma once
 
 #include "Foundation/Notification.h"
-#include "Foundation/NotificationNames.h"
 #include "Foundation/Ref.h"
 #include "Foundation/ThreadUtil.h"
 #include "Foundation/Timer.h"
 #include "Foundation/Uncopyable.h"
 #include "SQLite/ChangeSet.h"
 #include "SQLite/CursorWatch.h"
+#include "SQLite/DatabaseNotifications.h"
 #include "SQLite/DeletedRows.h"
 #include "SQLite/RowJournal.h"
 #include "SQLite/SQLText.h"
@@ -38,18 +38,9 @@ class Table;
 /// `Exception`s; using a closed connection is an `AssertionFailure`.
 ///
 /// Used on the thread that opened it, which runs the run loop; debug builds check that.
-class Database : Foundation::Uncopyable {
+class Database : public DatabaseNotifications, Foundation::Uncopyable {
  public:
     using TableChangeDict = SQLite::TableChangeDict;
-    static constexpr const Foundation::NotificationName& kDatabaseClosingNotification =
-        Foundation::NotificationNames::kDatabaseClosing;
-    static constexpr const Foundation::NotificationName& kDatabaseFatalErrorNotification =
-        Foundation::NotificationNames::kDatabaseFatalError;
-    static constexpr const Foundation::NotificationName& kDatabaseChangedNotification =
-        Foundation::NotificationNames::kDatabaseChanged;
-    static constexpr const Foundation::NotificationName& kDatabaseReplacedNotification =
-        Foundation::NotificationNames::kDatabaseReplaced;
-
     static constexpr double kSaveDelaySeconds = 5.0;
     static constexpr int kMaxRuns = 3;         ///< of a statement that meets transient errors
     static constexpr int kMaxFreePages = 256;  ///< that are left alone

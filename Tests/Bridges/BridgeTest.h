@@ -6,13 +6,14 @@
 #include "Bridges/OVEnclosureInternal.h"
 #include "Bridges/OVEntryInternal.h"
 #include "Bridges/OVFeedInternal.h"
-#include "Bridges/PublicObjectFactory.h"
+#include "Bridges/PublicObject.h"
 #include "Bridges/PublicSession.h"
 #include "Bridges/RecordingDelegate.h"
 #include "Bridges/WritingAgent.h"
 #include "Foundation/ApplicationIdentity.h"
 #include "Model/ClientTest.h"
 #include "Model/EnclosureCore.h"
+#include "Model/PublicObjects.h"
 
 #include <Orvane/OVClient.h>
 #include <Orvane/OVException.h>
