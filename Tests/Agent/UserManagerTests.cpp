@@ -87,6 +87,8 @@ TEST_F(UserManager, StartsTheAgentForACallAndEndsItInOrder) {
               "ActiveState=active\n700\n600\n"
               "Result=success\nExecMainStatus=0\nActiveState=inactive\n");
     EXPECT_THAT(log(), HasSubstr("    ... checked in with svcd!"));
+    EXPECT_THAT(log(), HasSubstr("[IPC] IPCServer: Got port 1 from svcd"));
+    EXPECT_THAT(log(), Not(HasSubstr("allocated and registered Mach port")));
     EXPECT_THAT(log(), HasSubstr("EXITING with status 0"));
     EXPECT_THAT(log(), Not(HasSubstr("Scheduling restart")));
     EXPECT_TRUE(fs::exists(database()));

@@ -19,7 +19,9 @@ class IPCRoutine : public AgentFixture {
     using Bytes = std::span<const std::uint8_t>;
     using Rows = std::span<const std::int64_t>;
 
-    IPCRoutine() : mPort(port()) {}
+    // Some calls are long ones where a sanitizer looks on.
+    IPCRoutine() : mPort(port()) { gOrvaneIPCTimeoutMS = 300'000; }
+    ~IPCRoutine() noexcept override { gOrvaneIPCTimeoutMS = 30'000; }
 
     /// Changes the file, before the agent has been started.
     void write(const std::string& statements) const {

@@ -8,6 +8,7 @@
 #include "Support/EnterNamespace.h"
 #include "Support/TurnUntil.h"
 
+#include <fcntl.h>
 #include <gtest/gtest.h>
 #include <sched.h>
 #include <sys/wait.h>
@@ -123,9 +124,10 @@ TEST_F(IPCServerTest, LeavesTheWorkToWhoTakesItsName) {
 TEST_F(IPCServerTest, RefusesFilesOfACallerThatSeesOthers) {
     client().startSkerrySync();
     int results[2];
-    ASSERT_EQ(pipe(results), 0);
+    ASSERT_EQ(pipe2(results, O_CLOEXEC), 0);
     const pid_t child = fork();
     if (child == 0) {
+        alarm(120);
         std::int32_t statuses[2] = {0, 0};
         if (Support::enterNamespace(CLONE_NEWNS) != Support::EnteredNamespace::kNot) {
             std::string error;
@@ -146,11 +148,12 @@ TEST_F(IPCServerTest, RefusesFilesOfACallerThatSeesOthers) {
         const bool isWritten = write(results[1], statuses, sizeof(statuses)) == sizeof(statuses);
         _exit(isWritten ? 0 : 1);
     }
+    // So that the end of the child is the end of what there is to read.
+    close(results[1]);
     std::int32_t statuses[2] = {0, 0};
     EXPECT_EQ(read(results[0], statuses, sizeof(statuses)), ssize_t{sizeof(statuses)});
     waitpid(child, nullptr, 0);
     close(results[0]);
-    close(results[1]);
     if (statuses[0] == -1) GTEST_SKIP() << "no mount namespace";
     EXPECT_EQ(statuses[0], kFailed);
     EXPECT_EQ(statuses[1], kFailed);
