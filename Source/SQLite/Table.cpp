@@ -125,9 +125,13 @@ Row* Table::_cachedRowWithID(RowID rowID) const {
 bool Table::isChanged() {
     if (!mChanged) return false;
     if (!mNewRows.empty()) return true;
-    mChanged = std::any_of(mRows.begin(), mRows.end(),
-                           [](const auto& entry) { return entry.second->mChanged; });
+    mChanged = std::ranges::any_of(mChangedRows, [this](RowID rowID) { return changedRow(rowID); });
     return mChanged;
+}
+
+Row* Table::changedRow(RowID rowID) const {
+    Row* const row = _cachedRowWithID(rowID);
+    return row && row->mChanged ? row : nullptr;
 }
 
 void Table::saveRows() {
@@ -156,19 +160,15 @@ void Table::saveNewRows() {
 }
 
 void Table::saveChangedRows() {
-    // By ID, and looked up one by one, as a save alters the map.
-    std::vector<RowID> rowIDs;
-    rowIDs.reserve(mRows.size());
-    for (const auto& entry : mRows) {
-        rowIDs.push_back(entry.first);
-    }
-    std::sort(rowIDs.begin(), rowIDs.end());
-    for (const RowID rowID : rowIDs) {
-        Row* const row = _cachedRowWithID(rowID);
-        if (!row || !row->mChanged) continue;
-        const AutoreleasePool pool;
-        const Ref<Row> held = row;
-        held->saveChanges();
+    // A save may change rows further on, which are then saved as well.
+    for (auto next = mChangedRows.begin(); next != mChangedRows.end();) {
+        const RowID rowID = *next;
+        if (Row* const row = changedRow(rowID)) {
+            const AutoreleasePool pool;
+            const Ref<Row> held = row;
+            held->saveChanges();
+        }
+        next = mChangedRows.upper_bound(rowID);
     }
 }
 

@@ -8,6 +8,7 @@
 
 #include <list>
 #include <memory>
+#include <set>
 #include <unordered_map>
 
 namespace Foundation {
@@ -122,6 +123,7 @@ class Table : Foundation::Uncopyable {
     void _uncacheNewRow(Row* row);
     void saveNewRows();
     void saveChangedRows();
+    Row* changedRow(RowID rowID) const;
     void _applyChangeNotification(const Foundation::Dictionary* changes, bool unloadUpdated);
     void applyChange(const Foundation::String* key, std::int64_t action, bool unloadUpdated);
     void unloadRow(Row* row);
@@ -136,6 +138,9 @@ class Table : Foundation::Uncopyable {
     const bool mRetainRows;
     Rows mRows;
     std::list<Foundation::Ref<Row>> mNewRows;
+    /// All changed rows of the file, and maybe some that are none any more: a table has thousands
+    /// of rows in memory of which a save concerns one.
+    std::set<RowID> mChangedRows;
     bool mChanged = false;
 };
 

@@ -29,6 +29,7 @@ void Table::_rowAdded(Row* row) {
 
 void Table::_rowChanged(Row* row) {
     _cacheRow(row, true);
+    if (row->mRowID != 0) mChangedRows.insert(row->mRowID);
     mChanged = true;
 }
 
@@ -41,6 +42,7 @@ void Table::_rowSaved(Row* row, bool wasNew) {
 
 void Table::_rowUnchanged(Row* row) {
     if (mCacheAllRows) {
+        mChangedRows.erase(row->mRowID);
         _cacheRow(row, false);
     } else {
         _uncacheRow(row);
@@ -82,7 +84,10 @@ void Table::_uncacheRow(Row* row) {
     gLogPersist.log("Table %s: Uncaching row #%lli [%p]", mName, row->mRowID, row);
     const auto entry = mRows.find(row->mRowID);
     // The map may know another object by now, if this one was let go of and lived on.
-    if (entry != mRows.end() && entry->second == row) mRows.erase(entry);
+    if (entry != mRows.end() && entry->second == row) {
+        mRows.erase(entry);
+        mChangedRows.erase(row->mRowID);
+    }
     row->setCached(false, false);
 }
 
@@ -102,6 +107,7 @@ void Table::uncacheRows() {
     gLogPersist.log("Table %s: Clearing row cache", mName);
     std::list<Ref<Row>> newRows;
     newRows.swap(mNewRows);
+    mChangedRows.clear();
     mChanged = false;
     for (const Ref<Row>& row : newRows) {
         row->mNew = false;
@@ -176,6 +182,7 @@ void Table::unloadRow(Row* row) {
 void Table::forgetRow(Rows::iterator entry) {
     gLogPersist.log("    ...uncached deleted row %lli", entry->first);
     Row* row = entry->second;
+    mChangedRows.erase(entry->first);
     mRows.erase(entry);
     row->setCached(false, false);
 }

@@ -7,6 +7,8 @@
 #include "SQLite/Transaction.h"
 #include "Support/AssertionOf.h"
 
+#include <utility>
+
 using namespace Foundation;
 using namespace SQLite;
 using Support::assertionOf;
@@ -205,6 +207,81 @@ TEST_F(TableTest, StaysChangedWhenASaveFails) {
     item->mTitle.setValue(text("other"));
     db().saveRows();
     EXPECT_EQ(item->getRowID(), 2);
+}
+
+namespace {
+
+/// A row that changes another one when it is saved.
+class Meddler : public Item {
+ public:
+    using Item::Item;
+    void saveChanges() override {
+        Item::saveChanges();
+        if (Meddler* row = std::exchange(other, nullptr)) row->mNumber.setValue(7);
+    }
+    Meddler* other = nullptr;
+};
+
+}  // namespace
+
+TEST_F(TableTest, SavesWhatASaveChangesFurtherOn) {
+    for (const char* title : {"a", "b", "c"}) {
+        saveItem(title);
+    }
+    TableOf<Meddler> table(&db(), "Items", true, false);
+    const Ref<Meddler> first = table.rowWithID(1);
+    const Ref<Meddler> middle = table.rowWithID(2);
+    const Ref<Meddler> last = table.rowWithID(3);
+    middle->mNumber.setValue(1);
+    middle->other = last.get();
+    table.saveRows();
+    EXPECT_EQ(count("number=7"), 1);
+    EXPECT_FALSE(table.isChanged());
+    // What is behind it already has to wait for the next time.
+    middle->mNumber.setValue(2);
+    middle->other = first.get();
+    table.saveRows();
+    EXPECT_TRUE(first->isChanged());
+    EXPECT_TRUE(table.isChanged());
+    EXPECT_EQ(count("number=7"), 1);
+    table.saveRows();
+    EXPECT_EQ(count("number=7"), 2);
+    EXPECT_FALSE(table.isChanged());
+}
+
+TEST_F(TableTest, KeepsWhatAFailedSaveHasNotReached) {
+    for (const char* title : {"a", "b", "c"}) {
+        saveItem(title);
+    }
+    const LogCapture log;
+    const Ref<Item> b = items()->rowWithID(2);
+    const Ref<Item> c = items()->rowWithID(3);
+    b->mTitle.setValue(text("a"));
+    c->mNumber.setValue(5);
+    EXPECT_THROW(items()->saveRows(), Exception);
+    EXPECT_TRUE(b->isChanged() && c->isChanged());
+    b->mTitle.setValue(text("d"));
+    items()->saveRows();
+    EXPECT_EQ(count("title='d' or number=5"), 2);
+    EXPECT_FALSE(items()->isChanged());
+}
+
+TEST_F(TableTest, IsUnchangedOnceItsChangedRowsAre) {
+    saveItem("a");
+    saveItem("b");
+    const Ref<Item> a = items()->rowWithID(1);
+    const Ref<Item> b = items()->rowWithID(2);
+    a->mNumber.setValue(1);
+    b->mNumber.setValue(1);
+    a->unload();
+    EXPECT_TRUE(items()->isChanged());
+    b->deleteRow();
+    EXPECT_FALSE(items()->isChanged());
+    items()->saveRows();
+    EXPECT_EQ(count("number=1"), 0);
+    a->mNumber.setValue(2);
+    items()->saveRows();
+    EXPECT_EQ(count("number=2"), 1);
 }
 
 TEST_F(TableTest, ForgetsAllRows) {
