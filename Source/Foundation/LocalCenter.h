@@ -1,10 +1,15 @@
 #pragma once
 
 #include "Foundation/PlatformCenter.h"
-#include "Foundation/Ref.h"
 #include "Foundation/String.h"
 
+#include <cstdint>
+#include <functional>
+#include <map>
 #include <memory>
+#include <string>
+#include <string_view>
+#include <unordered_map>
 #include <vector>
 
 namespace Foundation {
@@ -29,18 +34,38 @@ class LocalCenter : public PlatformCenter {
     struct Registration {
         void* observer;
         Callback callback;
-        Ref<String> name;
+        std::string name;
+        bool isOfAnyName;
         void* object;
+        std::uint64_t order;
         bool isOver = false;
 
-        bool wants(const String* postedName, const void* postedObject) const;
+        bool wants(const void* postedObject) const { return !object || object == postedObject; }
     };
-    using Registrations = std::vector<std::shared_ptr<Registration>>;
+    using RegistrationPointer = std::shared_ptr<Registration>;
+    using Registrations = std::vector<RegistrationPointer>;
+    /// In the order in which they were made.
+    using Ordered = std::map<std::uint64_t, RegistrationPointer>;
+    struct TextHash {
+        using is_transparent = void;
+        std::size_t operator()(std::string_view text) const noexcept {
+            return std::hash<std::string_view>()(text);
+        }
+    };
+    template <class Value>
+    using ByText = std::unordered_map<std::string, Value, TextHash, std::equal_to<>>;
 
+    void forget(const Registration& registration);
+    Registrations findFor(const String* name, const void* object) const;
     template <class Condition>
-    void removeIf(Condition condition);
+    void removeIf(void* observer, Condition condition);
 
-    Registrations mRegistrations;
+    // Every feed that is refreshed observes something, and each refresh posts several times:
+    // neither may cost more for what the other feeds do.
+    ByText<Ordered> mByName;
+    Ordered mOfAnyName;
+    std::unordered_map<void*, Registrations> mByObserver;
+    std::uint64_t mOrder = 0;
 };
 
 }  // namespace Foundation

@@ -1,6 +1,7 @@
 #include "Foundation/NotificationCenter.h"
 
 #include "Foundation/DictionaryOf.h"
+#include "Foundation/MutableString.h"
 #include "Foundation/Notification.h"
 #include "Foundation/NotificationRecorder.h"
 #include "Foundation/Number.h"
@@ -109,6 +110,24 @@ TEST_F(NotificationCenterTest, ARemovalForASenderLeavesTheOthers) {
     center->removeObserver(a, text("x"), nullptr);
     center->post(text("x"), &other, nullptr);
     EXPECT_EQ(order, Notes({"b", "a"}));
+}
+
+TEST_F(NotificationCenterTest, KnowsANameAsItWasAtTheRegistration) {
+    const Ref<MutableString> name = String::mutableString("x");
+    center->addObserver(a, name.get(), nullptr);
+    center->addObserver(b, nullptr, nullptr);
+    name->append("y");
+    center->post(text("x"), nullptr, nullptr);
+    center->post(name.get(), nullptr, nullptr);
+    EXPECT_EQ(a.notes, Notes({"x"}));
+    EXPECT_EQ(b.notes, Notes({"x", "xy"}));
+    center->removeObserver(a, text("xy"), nullptr);
+    center->removeObserver(b, text("x"), nullptr);
+    center->post(text("x"), nullptr, nullptr);
+    EXPECT_EQ(order, Notes({"a", "b", "b", "a", "b"}));
+    center->removeObserver(a, text("x"), nullptr);
+    center->post(text("x"), nullptr, nullptr);
+    EXPECT_EQ(a.notes.size(), 2u);
 }
 
 TEST_F(NotificationCenterTest, WhatIsRemovedDuringAPostIsNotCalledAnyMore) {
