@@ -12,6 +12,7 @@
 #include "Foundation/BusCenter.h"
 #include "Foundation/Logger.h"
 #include "Foundation/RunLoop.h"
+#include "Net/MemoryReturn.h"
 
 #include <csignal>
 
@@ -78,6 +79,7 @@ int OVAgentFrameworkMain() {
     using namespace Orvane;
     int status = 0;
     try {
+        MemoryReturn::keepRoomForDocuments();
         ApplicationIdentity::setIdentifier(kIdentifier);
         run();
     } catch (...) {

@@ -13,6 +13,8 @@ class MutableData : public Data {
     void append(Bytes bytes) { mStorage.append(bytes.view()); }
     /// Adds a copy of the bytes of `data`, which may be null or this.
     void append(const Data* data) { append(asBytes(data)); }
+    /// Makes room for so many bytes in all, so that what is added does not move.
+    void reserve(std::size_t length) { mStorage.reserve(length); }
     /// Cuts the data, or fills it up with zeros.
     void setLength(std::size_t length) { mStorage.resize(length); }
 

@@ -29,6 +29,10 @@ namespace {
 
 /// Longer than ours, which decides.
 constexpr long kNoConnectTimeoutSeconds = 86400;
+/// Four times what libcurl reads at once by itself: a document comes in a few pieces.
+constexpr long kBufferBytes = 64L << 10;
+/// Room that is kept for what comes next.
+constexpr std::size_t kMaxKeptBytes = std::size_t{1} << 20;
 
 /// A result beside libcurl's own: the client has failed.
 constexpr int kNotTaken = -1;
@@ -121,6 +125,7 @@ void CurlExchange::setUp(const ExchangeRequest& request) {
     set(easy, CURLOPT_CONNECTTIMEOUT, kNoConnectTimeoutSeconds);
     // A name server that does not answer must not keep the loop waiting for a transfer's end.
     set(easy, CURLOPT_QUICK_EXIT, 1L);
+    set(easy, CURLOPT_BUFFERSIZE, kBufferBytes);
     set(easy, CURLOPT_FOLLOWLOCATION, 0L);
     set(easy, CURLOPT_HTTP_CONTENT_DECODING, 0L);
     set(easy, CURLOPT_SUPPRESS_CONNECT_HEADERS, 1L);
@@ -338,13 +343,21 @@ void CurlExchange::handOn() {
         mHead.cookies = currentCookies();
         mClient.gotHead(std::exchange(mHead, {}));
     } else if (!mBody.empty()) {
-        const std::string body = std::exchange(mBody, {});
-        mClient.gotBody(body);
+        handOnBody();
     } else {
         const ExchangeEnd end = endFor(*std::exchange(mResult, {}));
         if (std::exchange(mIsRunning, false)) mTransport.remove(*this);
         mClient.ended(end);
     }
+}
+
+void CurlExchange::handOnBody() {
+    const std::weak_ptr<int> life = mLife;
+    std::string body = std::exchange(mBody, {});
+    mClient.gotBody(body);
+    if (life.expired() || !mBody.empty() || body.capacity() > kMaxKeptBytes) return;
+    body.clear();
+    mBody = std::move(body);
 }
 
 std::vector<std::string> CurlExchange::currentCookies() const {

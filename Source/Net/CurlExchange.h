@@ -64,6 +64,7 @@ class CurlExchange : public Exchange {
     bool isRefused() const;
     void handOn();
     void giveUp();
+    void handOnBody();
     std::vector<std::string> currentCookies() const;
     ExchangeEnd endFor(int result) const;
 

@@ -10,6 +10,7 @@
 
 #include <Orvane/OVErrorCode.h>
 
+#include <algorithm>
 #include <utility>
 
 namespace Orvane {
@@ -25,6 +26,18 @@ namespace {
 
 /// There was an error, and nobody knows which.
 constexpr NetError kUnknownError(NetError::kCustom, -1);
+
+/// What a server says of the length of a body is believed that far.
+constexpr long long kMaxReservedBytes = 1 << 20;
+
+/// The length that a body is said to have; 0 for none.
+std::size_t claimedLength(const ConnectionResponse* response) {
+    const HTTPMessage* message = response ? response->getHTTPMessage() : nullptr;
+    if (!message) return 0;
+    const Ref<String> name = String::string("Content-Length");
+    const Ref<String> length = message->getHeader(name.get());
+    return static_cast<std::size_t>(std::clamp(String::toLongLong(length), 0LL, kMaxReservedBytes));
+}
 
 bool isUnknown(const NetError& error) {
     return error.domain == kUnknownError.domain && error.code == kUnknownError.code;
@@ -177,6 +190,8 @@ void URLRequest::_didReceiveResponse(ConnectionResponse* response) {
 void URLRequest::_didReceiveData(Foundation::Data* data, long) {
     gLogHTTP.log("%@: Received %u bytes of data", this, static_cast<unsigned>(data->getLength()));
     if (mResponseData) {
+        // A block that grows as it comes is copied again and again.
+        if (mResponseData->getLength() == 0) mResponseData->reserve(claimedLength(mResponse));
         mResponseData->append(data);
     } else {
         mResponseData = Foundation::Data::mutableData(data->asBytes());

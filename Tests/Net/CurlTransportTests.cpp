@@ -11,6 +11,7 @@
 #include "Support/WebServer.h"
 
 #include <fcntl.h>
+#include <gmock/gmock.h>
 #include <netinet/in.h>
 #include <sys/socket.h>
 
@@ -301,6 +302,29 @@ TEST_F(CurlTransportTest, TakesNoMoreThanTheLengthThatIsClaimed) {
     mServer.answer("/a", ServerAnswer().claimLength(5).body("hello and more").close());
     EXPECT_EQ(fetch(mServer.url("/a")), "finished");
     EXPECT_EQ(body(), "hello");
+}
+
+TEST_F(CurlTransportTest, BelievesALengthNoFurtherThanABodyComes) {
+    // 1 TB is claimed: room for it is never asked of the system.
+    mServer.answer("/a", ServerAnswer().claimLength(std::uint64_t{1} << 40).body("xyz").close());
+    const std::size_t before = Support::ProcessMemory::now();
+    Support::ProcessMemory::forgetPeak();
+    EXPECT_THAT(fetch(mServer.url("/a")), testing::StartsWith("failed"));
+    EXPECT_LT(Support::ProcessMemory::peak(), before + 16 * kMiB);
+}
+
+TEST_F(CurlTransportTest, PutsPiecesOfEverySizeTogether) {
+    std::string body;
+    ServerAnswer answer;
+    for (std::size_t size = 1; size <= 256 << 10; size *= 4) {
+        const std::string piece(size, static_cast<char>('a' + body.size() % 26));
+        answer.body(piece).wait("piece");
+        body += piece;
+    }
+    mServer.answer("/a", answer);
+    mServer.letThrough("piece", 100);
+    EXPECT_EQ(fetch(mServer.url("/a")), "finished");
+    EXPECT_EQ(this->body(), body);
 }
 
 TEST_F(CurlTransportTest, TakesNoBodyOf304) {
