@@ -1,3 +1,4 @@
+#include "Benchmarks/FeedServer.h"
 #include "Benchmarks/PlainRows.h"
 #include "FeedParser/ParserPort.h"
 #include "Foundation/AutoreleasePool.h"
@@ -6,18 +7,18 @@
 #include "Foundation/URL.h"
 #include "Model/FeedCore.h"
 #include "Model/Schema.h"
+#include "Net/MemoryReturn.h"
 #include "Net/NetPorts.h"
 #include "SQLite/Cursor.h"
 #include "SQLite/Database.h"
 #include "SQLite/TableOf.h"
 #include "Support/ChildProcess.h"
-#include "Support/ScriptedServer.h"
+#include "Support/PrivateBus.h"
 #include "Support/TempDir.h"
 #include "Utilities/FileSystem.h"
 
 #include <libxml/xmlreader.h>
 #include <sys/resource.h>
-#include <sys/wait.h>
 #include <unistd.h>
 
 #include <cstdio>
@@ -34,6 +35,11 @@
 /// libxml2's reader over them, and sqlite3 inserting the same rows, a transaction a feed; both
 /// databases write as they do in earnest. All of it is processor time, for the server, a process of
 /// its own on this machine, takes the rest.
+///
+/// The feeds are subscribed to, and what changes is announced on a message bus. A round asks once
+/// for each feed, over four connections at most, and with its condition from the second round on.
+/// A hundred rounds must leave the process no larger than ten: of feeds with nothing new, and of
+/// feeds from which an entry falls out for each that comes.
 
 using namespace Benchmarks;
 using namespace Foundation;
@@ -42,80 +48,15 @@ using SQLite::gDatabase;
 
 namespace {
 
-constexpr int kEntries = 50;
-constexpr int kTextBytes = 2048;
 constexpr int kFeeds = 1000;
+constexpr int kTimes = 10;  ///< as many feeds in the large round
+constexpr int kRollingFeeds = 100;
 constexpr int kQuietRounds = 5;
-constexpr const char* kTag = "\"1\"";
+constexpr int kMemoryRounds = 100;
+constexpr int kMostConnections = 4;
+/// What an allocator leaves here and there.
+constexpr double kFlatMegabytes = 2;
 constexpr const char* kInEarnest = "PRAGMA journal_mode = WAL; PRAGMA synchronous = FULL";
-
-std::string documentOf(const std::string& path) {
-    std::string xml = "<rss version=\"2.0\"><channel><title>News</title>";
-    for (int i = 0; i < kEntries; ++i) {
-        xml += fmt::format(
-            "<item><title>The title of entry {0} of {1}</title>"
-            "<guid isPermaLink=\"false\">{1}-{0}</guid>"
-            "<pubDate>Tue, 06 Jun 2006 10:00:00 GMT</pubDate><description>{2}</description></item>",
-            i, path, std::string(kTextBytes, static_cast<char>('a' + i % 26)));
-    }
-    return xml + "</channel></rss>";
-}
-
-/// Below "/tagged/" with a validator, which is heeded; elsewhere without.
-Support::ServerAnswer answerTo(const Support::ServerRequest& request) {
-    const bool isTagged = request.path().starts_with("/tagged/");
-    if (isTagged && request.header("if-none-match") == kTag) {
-        return Support::ServerAnswer(304).header("ETag", kTag);
-    }
-    Support::ServerAnswer answer;
-    answer.header("Content-Type", "application/rss+xml").body(documentOf(request.path()));
-    if (isTagged) answer.header("ETag", kTag);
-    return answer;
-}
-
-/// The server, in a process that ends with this one.
-class ServerProcess {
- public:
-    ServerProcess() {
-        int toParent[2], toChild[2];
-        if (pipe(toParent) != 0 || pipe(toChild) != 0) throw std::runtime_error("pipe");
-        mPID = fork();
-        if (mPID == 0) {
-            close(toChild[1]);
-            serve(toParent[1], toChild[0]);
-        }
-        close(toChild[0]);
-        mEnd = toChild[1];
-        require(read(toParent[0], &mPort, sizeof mPort) == sizeof mPort, "no server");
-    }
-    ~ServerProcess() {
-        close(mEnd);
-        waitpid(mPID, nullptr, 0);
-    }
-    ServerProcess(const ServerProcess&) = delete;
-    ServerProcess& operator=(const ServerProcess&) = delete;
-
-    std::string url(const char* kind, int feed) const {
-        return fmt::format("http://127.0.0.1:{}/{}/{}.xml", mPort, kind, feed);
-    }
-
- private:
-    [[noreturn]] static void serve(int port, int end) {
-        {
-            Support::ScriptedServer server;
-            server.answerOthersBy(answerTo);
-            const int number = server.getPort();
-            static_cast<void>(!write(port, &number, sizeof number));
-            char nothing;
-            static_cast<void>(!read(end, &nothing, 1));
-        }
-        _exit(0);
-    }
-
-    pid_t mPID = -1;
-    int mPort = 0;
-    int mEnd = -1;
-};
 
 double processorSeconds() {
     rusage usage{};
@@ -135,7 +76,7 @@ double residentMegabytes() {
 /// The feeds of one kind, in the process's database.
 class Feeds {
  public:
-    Feeds(const ServerProcess& server, const char* kind, int count) : mServer(server), mKind(kind) {
+    Feeds(FeedServer& server, const char* kind, int count) : mServer(server), mKind(kind) {
         for (int i = 0; i < count; ++i) {
             const AutoreleasePool pool;
             const Ref<FeedCore> feed = Returner<FeedCore>::adopted(new FeedCore);
@@ -143,6 +84,10 @@ class Feeds {
             feed->getIdentifier();
             feed->saveChanges();
             mFeeds.push_back(feed);
+            gDatabase->execute(
+                "insert into Subscriptions (client, feed, refreshInterval, refreshesInBackground, "
+                "unreadCount) values (1, %lld, 1800, 1, 0)",
+                feed->getRowID());
         }
     }
 
@@ -151,6 +96,7 @@ class Feeds {
 
     /// The processor time of a round over all of them, which must change so many.
     double refresh(int changes) {
+        mServer.startRound();
         const double start = processorSeconds();
         mEnds = mChanges = 0;
         MethodReceiver<Notification, Feeds> receiver(this, &Feeds::ended);
@@ -163,8 +109,11 @@ class Feeds {
         if (mEnds < count()) RunLoop::current().run();
         NotificationCenter::getLocal()->removeObserver(&receiver);
         gDatabase->saveRows();
+        const double seconds = processorSeconds() - start;
         require(mChanges == changes, "other feeds have changed than were to");
-        return processorSeconds() - start;
+        require(mServer.getRequests() == count(), "not each feed was asked for once");
+        require(mServer.getConnections() <= kMostConnections, "too many connections");
+        return seconds;
     }
     /// The processor time of curl for the same.
     double curl(const Support::TempDir& directory, const std::string& header) const {
@@ -196,7 +145,7 @@ class Feeds {
         if (++mEnds == count()) RunLoop::current().stop();
     }
 
-    const ServerProcess& mServer;
+    FeedServer& mServer;
     const char* mKind;
     std::vector<Ref<FeedCore>> mFeeds;
     int mEnds = 0;
@@ -252,6 +201,20 @@ double insert(const Feeds& feeds, const std::string& path, const std::string& pl
     return seconds;
 }
 
+/// Goes through many rounds, after which the process must be no larger than after the tenth.
+void stayFlat(Feeds& feeds, int changes, const char* what) {
+    double early = 0;
+    for (int i = 1; i <= kMemoryRounds; ++i) {
+        const AutoreleasePool pool;
+        feeds.refresh(changes);
+        if (i == 10) early = residentMegabytes();
+    }
+    const double late = residentMegabytes();
+    std::printf("resident after 10 and %d rounds of %s: %.1f and %.1f MB\n", kMemoryRounds, what,
+                early, late);
+    require(late - early <= kFlatMegabytes, "memory is lost from round to round");
+}
+
 struct FirstRound {
     Comparison costs{0, 0};
     int feeds = 0;
@@ -282,7 +245,9 @@ FirstRound first(Feeds& feeds, const Support::TempDir& directory, const std::str
 
 int main(int argc, char** argv) try {
     // The server is made before anything that a fork would copy.
-    const ServerProcess server;
+    FeedServer server;
+    const Support::PrivateBus bus;
+    MemoryReturn::keepRoomForDocuments();
     const bool isLarge = argc > 1 && std::string(argv[1]) == "large";
     const AutoreleasePool pool;
     const Support::TempDir directory;
@@ -292,30 +257,36 @@ int main(int argc, char** argv) try {
     SQLite::Database::initialize();
     gDatabase->open(path.c_str(), true);
     Schema::createDatabase();
+    gDatabase->setPostsNotifications(true);
+    gDatabase->execute("insert into Clients (rowID, signature) values (1, 'org.example.Reader')");
     const NetPorts ports;
 
     Feeds tagged(server, "tagged", kFeeds);
     const FirstRound import = first(tagged, directory, path);
     report("a first round, for a feed", import.costs, kFeeds, "curl, libxml2 and sqlite3");
-    const Comparison unchanged = quiet(tagged, directory, fmt::format("If-None-Match: {}", kTag));
+    tagged.refresh(0);
+    require(server.getUnchanged() == kFeeds, "a feed was fetched again right after the first time");
+    const std::string condition = fmt::format("If-None-Match: {}", kTag);
+    const Comparison unchanged = quiet(tagged, directory, condition);
     report("a round with nothing new, for a feed", unchanged, kFeeds, "curl -Z");
-    const double before = residentMegabytes();
-    for (int i = 0; i < 100; ++i) {
-        const AutoreleasePool inner;
-        tagged.refresh(0);
-    }
-    std::printf("resident: %.0f MB, after 100 rounds more %.0f MB\n", before, residentMegabytes());
+    stayFlat(tagged, 0, "nothing new");
 
     Feeds same(server, "same", kFeeds);
     same.refresh(kFeeds);
     const Comparison identical = quiet(same, directory, "");
     report("a round of the same bytes, for a feed", identical, kFeeds, "curl -Z");
 
+    Feeds rolling(server, "rolling", kRollingFeeds);
+    stayFlat(rolling, kRollingFeeds, "an entry more in each feed");
+
     if (isLarge) {
-        Feeds many(server, "many", 10 * kFeeds);
+        Feeds many(server, "tagged-many", kTimes * kFeeds);
         const FirstRound large = first(many, directory, path);
-        report("ten times the feeds, for a feed", large.costs, 10 * kFeeds,
+        report("ten times the feeds, first, for a feed", large.costs, kTimes * kFeeds,
                "curl, libxml2 and sqlite3");
+        const Comparison idle = quiet(many, directory, condition);
+        report("ten times the feeds, nothing new, for a feed", idle, kTimes * kFeeds, "curl -Z");
+        std::printf("refresh_unchanged_scale %.2f\n", idle.measured / unchanged.measured);
         std::printf("refresh_scale %.2f\n", large.costs.measured / import.costs.measured);
     }
     gDatabase->close(true);
