@@ -9,12 +9,12 @@
 #include "FeedParser/DifferenceEngine.h"
 #include "FeedParser/Documents.h"
 #include "Foundation/ClockTrust.h"
+#include "Model/AuthorCore.h"
 #include "Model/EnclosureCore.h"
 #include "Model/EntryCore.h"
 #include "Model/UpdatedEntryIterator.h"
 #include "SQLite/TableOf.h"
 #include "SQLite/Transaction.h"
-#include "Utilities/FileDeletionQueue.h"
 
 #include <Orvane/OVEntryQuery.h>
 #include <gmock/gmock.h>
@@ -107,7 +107,8 @@ class QueryPlanTest : public AgentTest, public testing::WithParamInterface<Past>
         clearTables();
         addFeeds(2, 2, 3);
     }
-    /// Merges two documents: of the first one's entries one changes, and one falls out.
+    /// Merges two documents, of which the second has a changed entry and a new one. None falls out:
+    /// a feed without an archive leaves no directory to be deleted behind the test's back.
     static void merge(FeedCore* feed) {
         const std::string address = feed->mURL.getValue()->text();
         const auto mergeDocument = [&](const std::vector<Post>& posts) {
@@ -115,7 +116,10 @@ class QueryPlanTest : public AgentTest, public testing::WithParamInterface<Past>
             EXPECT_TRUE(DifferenceEngine(Ref<FeedCore>(feed), false).updateFrom(parsed));
         };
         mergeDocument({{.guid = "a", .length = 5}, {.guid = "b"}, {.guid = "c"}});
-        mergeDocument({{.guid = "a", .title = "New", .length = 6}, {.guid = "b"}, {.guid = "d"}});
+        mergeDocument({{.guid = "a", .title = "New", .length = 6},
+                       {.guid = "b"},
+                       {.guid = "c"},
+                       {.guid = "d"}});
     }
     /// What is asked for one feed or entry by others.
     static void askAbout(ClientCore& client, FeedCore& feed) {
@@ -141,6 +145,11 @@ class QueryPlanTest : public AgentTest, public testing::WithParamInterface<Past>
             const UpdatedEntryIterator updated(&client, past);
         }
         EXPECT_TRUE(EnclosureCore::getEnclosures(&client, nullptr).hasRow());
+        const Ref<AuthorCore> author = Returner<AuthorCore>::adopted(new AuthorCore);
+        author->mName.setValue(client.mSignature.getValue());
+        EXPECT_EQ(Ref<AuthorCore>(author->findInDatabase()).get(), nullptr);
+        EXPECT_EQ(Ref<AuthorCore>(author->addToDatabase()).get(), author.get());
+        EXPECT_NE(Ref<AuthorCore>(author->findInDatabase()).get(), nullptr);
     }
     /// What applications ask for lists of entries.
     static void list(const ClientCore& client) {
@@ -170,7 +179,6 @@ class QueryPlanTest : public AgentTest, public testing::WithParamInterface<Past>
         entry->deleteRow();
         const Ref<SubscriptionCore> subscription = client->getSubscription(feed);
         subscription->deleteRow();
-        FileDeletionQueue::shared().waitUntilIdle();
     }
     /// What is asked while the agent schedules, looks after the database, counts and merges.
     std::set<std::string> askedQueries() {
@@ -259,8 +267,12 @@ TEST_F(QueryPlanTest, UsesAnIndexForAllButWalksOfWholeTables) {
         const bool readsAll =
             query == "SELECT * FROM Subscriptions" || query.find("sqlite_") != std::string::npos;
         EXPECT_EQ(plan.find("AUTOMATIC"), std::string::npos);
-        EXPECT_EQ(plan.find("SCAN Entries"), std::string::npos);
-        EXPECT_EQ(plan.find("SCAN Contents"), std::string::npos);
+        // By their names in the queries.
+        for (const char* table :
+             {"Authors", "Contents", "Entries", "a", "c", "e", "encl", "entry", "n", "s", "sub"}) {
+            EXPECT_EQ(plan.find(OVFormat("SCAN %s\n", table)), std::string::npos);
+            EXPECT_EQ(plan.find(OVFormat("SCAN %s USING", table)), std::string::npos);
+        }
         EXPECT_TRUE(readsAll || plan.find("SCAN Subscriptions") == std::string::npos);
         EXPECT_TRUE(query.find("downloadAuditStatus=1") != std::string::npos ||
                     plan.find("SCAN Enclosures") == std::string::npos);
