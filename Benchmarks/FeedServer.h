@@ -16,6 +16,7 @@
 namespace Benchmarks {
 
 constexpr int kEntries = 50;
+constexpr int kAuthors = 5;  ///< of a feed
 constexpr int kTextBytes = 2048;
 constexpr const char* kTag = "\"1\"";
 
@@ -26,8 +27,9 @@ inline std::string documentOf(const std::string& path, int newest = kEntries) {
         xml += fmt::format(
             "<item><title>The title of entry {0} of {1}</title>"
             "<guid isPermaLink=\"false\">{1}-{0}</guid>"
+            "<author>{3}@example.org{1} (Author {3})</author>"
             "<pubDate>Tue, 06 Jun 2006 10:00:00 GMT</pubDate><description>{2}</description></item>",
-            i, path, std::string(kTextBytes, static_cast<char>('a' + i % 26)));
+            i, path, std::string(kTextBytes, static_cast<char>('a' + i % 26)), i % kAuthors);
     }
     return xml + "</channel></rss>";
 }

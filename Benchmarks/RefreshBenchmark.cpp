@@ -231,6 +231,8 @@ FirstRound first(Feeds& feeds, const Support::TempDir& directory, const std::str
     FirstRound round;
     round.feeds = feeds.count();
     round.costs.measured = feeds.refresh(feeds.count());
+    // Before the floors, which are in this process too.
+    std::printf("resident with %d feeds: %.1f MB\n", feeds.count(), residentMegabytes());
     const double fetching = feeds.curl(directory, "");
     const double walking = walk(feeds);
     const double inserting = insert(feeds, path, plainPath);

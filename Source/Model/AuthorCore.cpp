@@ -3,6 +3,7 @@
 #include "Foundation/Logger.h"
 #include "Foundation/URL.h"
 #include "Model/AgentLink.h"
+#include "Model/AuthorIndex.h"
 #include "Model/PublicObjects.h"
 #include "SQLite/Database.h"
 #include "SQLite/QueryOf.h"
@@ -54,6 +55,11 @@ Returner<AuthorCore> AuthorCore::findInDatabase() {
     if (getTable()) return Returner<AuthorCore>::retained(this);
     if (!SQLite::gDatabase || !SQLite::gDatabase->isOpen()) return nullptr;
     SQLite::TableOf<AuthorCore>* table = SQLite::TableOf<AuthorCore>::instance();
+    if (SQLite::gDatabase->isWriteable()) {
+        static auto* const sIndex = new AuthorIndex(SQLite::gDatabase);
+        const SQLite::RowID rowID = sIndex->find({mName, mEmail, mURL});
+        return rowID != 0 ? table->rowWithID(rowID) : nullptr;
+    }
     static auto* const sQuery = new SQLite::QueryOf<AuthorCore>(
         table,
         "select rowID from Authors  where ifnull(name,'')=? and ifnull(email,'')=?"
