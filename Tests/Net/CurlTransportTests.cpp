@@ -90,8 +90,8 @@ class CurlTransportTest : public testing::Test {
             const Foundation::AutoreleasePool pool;
             mRequest = nullptr;
         }
-        Foundation::RunLoop::current().turn();
-        EXPECT_LT(Support::ProcessMemory::now(), before + 16 * kMiB);
+        EXPECT_TRUE(
+            Support::turnUntil([&] { return Support::ProcessMemory::now() < before + 16 * kMiB; }));
     }
 
     /// The flags of the descriptors of this process that are connected to the server.

@@ -1,3 +1,5 @@
+#include "Net/HTTPRequest.h"
+#include "Net/NetTest.h"
 #include "Net/ServerTest.h"
 #include "Support/EnvVar.h"
 #include "Support/WebServer.h"
@@ -53,6 +55,31 @@ TEST_F(GoodServerTest, SendsCompressedDocuments) {
     FeedCore& feed = *storedFeed(server.url("/feed.xml").c_str());
     EXPECT_EQ(refresh(feed), "changed");
     EXPECT_EQ(text(feed.getXMLData()), body);
+}
+
+TEST_F(GoodServerTest, SendsPartsOfFiles) {
+    const NginxServer server;
+    server.files().writeFile("file", "0123456789");
+    const auto getPart = [&](const char* part) {
+        const Ref<HTTPRequest> request = Returner<HTTPRequest>::adopted(
+            new HTTPRequest(url(server.url("/file").c_str()), string("GET")));
+        request->setHeader(string("Range"), string(part));
+        RequestRecorder recorder(*request);
+        request->setAccumulatesData(false);
+        request->start(true);
+        EXPECT_TRUE(Support::turnUntil([&] { return recorder.isOver; }));
+        const HTTPMessage& response = *request->getHTTPResponse();
+        std::string result = std::to_string(response.getStatus()) + " ";
+        if (response.getStatus() == 206) result += response.getHeader("Content-Range") + " ";
+        for (const std::string& block : recorder.blocks) {
+            if (response.getStatus() < 400) result += block;
+        }
+        return result;
+    };
+    EXPECT_EQ(getPart("bytes=4-"), "206 bytes 4-9/10 456789");
+    EXPECT_EQ(getPart("bytes=2-3"), "206 bytes 2-3/10 23");
+    EXPECT_EQ(getPart("bytes=10-"), "416 ");
+    EXPECT_EQ(getPart("lines=1-"), "200 0123456789");
 }
 
 TEST_F(GoodServerTest, MovesDocumentsForGoodAndForAWhile) {

@@ -436,6 +436,21 @@ TEST_F(PollingFeederTest, WarnsOfParsingAndMergingThatTakeLong) {
     }
 }
 
+TEST_F(PollingFeederTest, LogsWhatItGets) {
+    const LoggingOn on({&gLogFeed});
+    const std::string bytes = std::to_string(rss("A").size());
+    refresh(document(rss("A")));
+    EXPECT_EQ(log.count("[Feed] Got contents (" + bytes + " bytes) of " + text(feed->toString())),
+              1);
+    FeedCore* local = storedFeed(("file://" + directory.writeFile("f", rss("A"))).c_str());
+    const Ref<PollingFeeder> reader = feederOf(*local);
+    reader->refresh(false, true);
+    turn();
+    EXPECT_EQ(log.count("[Feed] Reading contents of <" + text(local->mURL.getValue()) + ">"), 1);
+    EXPECT_EQ(log.count("[Feed] Got contents (" + bytes + " bytes) of " + text(local->toString())),
+              1);
+}
+
 TEST_F(PollingFeederTest, CountsHowManyThereAre) {
     const LoggingOn on({&gLogFeed});
     const int before = PollingFeeder::getObjectCount();
@@ -447,7 +462,10 @@ TEST_F(PollingFeederTest, CountsHowManyThereAre) {
         other->removeFeeder();
     }
     EXPECT_EQ(PollingFeeder::getObjectCount(), before);
-    EXPECT_EQ(log.count(OVFormat("destroyed, %d remain", before)), 1);
+    ASSERT_FALSE(log.lines().empty());
+    const std::string last = log.lines().back();
+    EXPECT_EQ(last.find("[Feed] PollingFeeder "), 0U) << last;
+    EXPECT_EQ(log.count(OVFormat(" destroyed, %d remain", before)), 1);
 }
 
 TEST_F(PollingFeederTest, RefreshesAFeedInMemory) {

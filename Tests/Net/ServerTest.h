@@ -50,8 +50,13 @@ class ServerTest : public FeedTest {
     }
 
  private:
+    /// With one turn more, which the watch needs to see the last one that the network had. A merge
+    /// may take longer than that may.
     static bool turnUntilEnded(Orvane::FeedCore& feed) {
-        return Support::turnUntil([&] { return !feederOf(feed)->isRefreshing(); });
+        const auto hasEnded = [&] { return !feederOf(feed)->isRefreshing(); };
+        if (!Support::turnUntil(hasEnded)) return false;
+        int turns = feederOf(feed)->hasChanged() ? 2 : 0;
+        return Support::turnUntil([&] { return ++turns > 2; });
     }
 
     Orvane::PollingFeederFactory mFactory;
