@@ -20,7 +20,6 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
-#include <cerrno>
 #include <csignal>
 #include <cstring>
 #include <optional>
@@ -53,8 +52,10 @@ class AgentProcess : public AgentProcessTest {
     int end(int signal) {
         kill(agent->getPID(), signal);
         int status = -1;
-        while (waitpid(agent->getPID(), &status, 0) < 0 && errno == EINTR) {
-        }
+        const auto hasEnded = [&] {
+            return waitpid(agent->getPID(), &status, WNOHANG) == agent->getPID();
+        };
+        EXPECT_TRUE(turnUntil(hasEnded)) << log();
         return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
     }
     /// Runs it to its end.
@@ -77,7 +78,8 @@ TEST_F(AgentOnBus, StartsByHandAndEndsInOrderAtSIGTERM) {
     std::size_t last = 0;
     for (const char* line :
          {"----- Orvane Agent STARTING -----", "LaunchListener: Checking in with svcd",
-          "    ... not launched by svcd (SVC_KEY_IS_MANAGED == 0)", "Starting AgentTask", kRunning,
+          "    ... not launched by svcd (SVC_KEY_IS_MANAGED == 0)", "Starting AgentTask",
+          "Orvane Agent starting API MIG server", kRunning,
           "***** LaunchListener got signal: 15 (Terminated) x1", "Orvane Agent exited runloop",
           "===== Closing database =====", "----- Orvane Agent EXITING with status 0 -----\n\n"}) {
         const std::size_t place = said.find(line, last);

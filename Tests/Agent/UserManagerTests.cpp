@@ -40,9 +40,9 @@ class UserManager : public AgentProcessTest {
     }
     /// Lets a shell do these lines beside the manager, for five minutes at most. What it wrote.
     std::string inManager(const std::string& lines) {
-        const ChildResult result =
-            Support::runChild({IN_USER_MANAGER, home.path().string(), "timeout", "300", "bash",
-                               "-c", "set -u\n" + lines});
+        const ChildResult result = Support::runChild(
+            {"/usr/bin/timeout", "--kill-after=10", "400", IN_USER_MANAGER, home.path().string(),
+             "timeout", "300", "bash", "-c", "set -u\n" + lines});
         if (result.status == 77) {
             mReason = result.out;
         } else {

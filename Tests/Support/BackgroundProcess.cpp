@@ -1,7 +1,11 @@
 #include "Support/BackgroundProcess.h"
 
+#include "Foundation/UniqueFD.h"
+
 #include <fcntl.h>
+#include <poll.h>
 #include <sys/prctl.h>
+#include <sys/syscall.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -41,8 +45,17 @@ BackgroundProcess::BackgroundProcess(const std::vector<std::string>& command) {
 
 BackgroundProcess::~BackgroundProcess() {
     kill(mPID, SIGTERM);
+    if (!endsInTime()) kill(mPID, SIGKILL);
     while (waitpid(mPID, nullptr, 0) < 0 && errno == EINTR) {
     }
+}
+
+/// Also where it has ended and was waited for.
+bool BackgroundProcess::endsInTime() const {
+    constexpr int kMilliseconds = 60'000;
+    const Foundation::UniqueFD process(static_cast<int>(syscall(SYS_pidfd_open, mPID, 0)));
+    pollfd wanted = {.fd = process.get(), .events = POLLIN, .revents = 0};
+    return !process || poll(&wanted, 1, kMilliseconds) != 0;
 }
 
 }  // namespace Support

@@ -13,7 +13,7 @@ class BackgroundProcess {
  public:
     /// Starts the program, found by the PATH, with its arguments.
     explicit BackgroundProcess(const std::vector<std::string>& command);
-    /// Ends it, and waits until it has.
+    /// Ends it, and waits until it has: after a minute by force.
     ~BackgroundProcess();
     BackgroundProcess(const BackgroundProcess&) = delete;
     BackgroundProcess& operator=(const BackgroundProcess&) = delete;
@@ -21,6 +21,8 @@ class BackgroundProcess {
     pid_t getPID() const { return mPID; }
 
  private:
+    bool endsInTime() const;
+
     pid_t mPID;
 };
 
