@@ -7,6 +7,7 @@
 /// fractions of microseconds. A plain value. Any thread.
 class OVDate {
  public:
+    /// A point in time of the standard library.
     using TimePoint = std::chrono::system_clock::time_point;
 
     /// REQUIRES: a number.
@@ -23,6 +24,7 @@ class OVDate {
     /// Seconds after this date, before it if negative.
     constexpr OVDate addingSeconds(double seconds) const { return OVDate(mAbsoluteTime + seconds); }
 
+    /// By the time.
     constexpr bool operator==(const OVDate&) const = default;
     constexpr std::partial_ordering operator<=>(const OVDate&) const = default;
 

@@ -23,6 +23,7 @@ class OV_EXPORT OVEntry : public OVObject {
  public:
     using Text = std::optional<std::string>;  ///< none for what there is not
     using Time = std::optional<OVDate>;       ///< none for what is not known
+    /// None of them is null.
     using List = std::vector<std::shared_ptr<OVEntry>>;
 
     /// The entry stays in the database.

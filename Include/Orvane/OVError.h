@@ -15,6 +15,7 @@ class OVError {
     /// An error without texts.
     OVError(std::string domain, int code) : mDomain(std::move(domain)), mCode(code) {}
 
+    /// Whose error it is, and which of his: see `OVErrorCode.h`.
     const std::string& domain() const { return mDomain; }
     int code() const { return mCode; }
 
@@ -34,6 +35,7 @@ class OVError {
     const std::map<std::string, int>& userInfo() const { return mUserInfo; }
     void setUserInfo(std::map<std::string, int> info) { mUserInfo = std::move(info); }
 
+    /// By all of these.
     bool operator==(const OVError&) const = default;
 
     /// A text for logs: the description, if there is one, with domain and code.

@@ -11,6 +11,7 @@
 /// or the application broke a rule of the interface. `what()` tells what happened, in English.
 class OV_EXPORT OVException : public std::runtime_error {
  public:
+    /// Without more than the text.
     explicit OVException(const std::string& text);
     /// The same with what it was that failed.
     OVException(const std::string& text, const OVError& error);

@@ -12,13 +12,15 @@
 /// URLs are texts in UTF-8; what is no URL is like none. Failures are reported in the log, and give
 /// none or false. Thread: see `OVObject`.
 struct OVFeedURLUtils {
+    /// In UTF-8; none where there is nothing.
     using Text = std::optional<std::string>;
 
     /// A set of feeds.
     struct Aggregate {
+        /// Of the feeds.
         std::vector<std::string> urls;
-        Text name;
-        Text uuid;
+        Text name;    ///< for people
+        Text uuid;    ///< what tells it from other sets of this name
         Text filter;  ///< the words that entries must have
     };
 

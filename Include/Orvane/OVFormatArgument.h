@@ -19,6 +19,7 @@ class OVFormatArgument {
     /// Gives an object's text for `%@`. May return any text; must not keep the pointer.
     using Describe = std::string (*)(const void* object);
 
+    /// Of a number or a text.
     OVFormatArgument(std::signed_integral auto value)
         : mKind(OVFormatKind::Signed), mSigned(value) {}
     OVFormatArgument(std::unsigned_integral auto value)
@@ -37,6 +38,7 @@ class OVFormatArgument {
     OVFormatArgument(const void* object, Describe describe)
         : mKind(OVFormatKind::Object), mObject{object, describe} {}
 
+    /// Which of the following it has.
     OVFormatKind kind() const { return mKind; }
     std::int64_t signedValue() const { return mSigned; }
     std::uint64_t unsignedValue() const { return mUnsigned; }

@@ -35,14 +35,15 @@ struct OVNotification {
     /// Entries, or identifiers of entries that are gone.
     using List = std::variant<OVEntry::List, std::vector<std::string>>;
 
-    std::string name;
-    std::shared_ptr<OVObject> object;
-    std::map<std::string, List> info;
+    std::string name;                  ///< one of those above, or the application's own
+    std::shared_ptr<OVObject> object;  ///< what it happened to; may be null
+    std::map<std::string, List> info;  ///< more, by the keys above
 };
 
 /// Where changes are announced in the application. The thread of the library's objects.
 class OVNotificationCenter {
  public:
+    /// What is called with a notification.
     using Observer = std::function<void(const OVNotification&)>;
     /// An observer is called for as long as somebody holds this.
     using Observation = std::shared_ptr<void>;

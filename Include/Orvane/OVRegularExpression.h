@@ -19,10 +19,13 @@ struct OVRange {
     /// The location of what is not there.
     static constexpr std::int64_t kNotFound = std::numeric_limits<std::int64_t>::max();
 
+    /// Where it begins, and how long it is.
     std::int64_t location = kNotFound;
     std::int64_t length = 0;
 
+    /// Whether there is such a piece.
     bool isFound() const { return location != kNotFound; }
+    /// By location and length.
     bool operator==(const OVRange&) const = default;
 };
 

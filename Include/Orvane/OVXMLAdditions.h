@@ -19,7 +19,7 @@
 
 /// A text that stands in no tree.
 struct OVXMLText {
-    std::string string;
+    std::string string;    ///< what it says
     bool isCDATA = false;  ///< whether it is written as a CDATA section
 };
 

@@ -35,6 +35,7 @@ class OVXMLElement {
     /// The element as XML, complete in itself.
     OV_EXPORT std::string XMLString() const;
 
+    /// For the library.
     explicit OVXMLElement(std::shared_ptr<const Tree> tree) : mTree(std::move(tree)) {}
     const Tree& _tree() const { return *mTree; }
 

@@ -22,6 +22,7 @@
 #include <Orvane/OVLog.h>
 #include <Orvane/OVNotificationCenter.h>
 #include <Orvane/OVRegularExpression.h>
+#include <Orvane/OVRunLoop.h>
 #include <Orvane/OVUtils.h>
 #include <Orvane/OVXMLAdditions.h>
 #include <Orvane/OVXMLElement.h>

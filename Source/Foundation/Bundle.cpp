@@ -3,6 +3,7 @@
 #include "Foundation/AssertionFailure.h"
 #include "Foundation/Data.h"
 #include "Foundation/EnglishTexts.h"
+#include "Foundation/InstalledTree.h"
 #include "Foundation/Ref.h"
 #include "Foundation/String.h"
 #include "Foundation/URL.h"
@@ -22,7 +23,8 @@ constexpr const char* kTextDomain = "orvane";
 
 std::string frameworkDirectory() {
     const char* set = std::getenv("ORVANE_RESOURCES");
-    return set && *set == '/' ? set : ORVANE_INSTALLED_RESOURCES;
+    if (set && *set == '/') return set;
+    return InstalledTree::findDirectory(ORVANE_RESOURCES_FROM_LIBRARY, ORVANE_INSTALLED_RESOURCES);
 }
 
 /// Where the translations of a directory of resources are: "share/locale" beside "share/orvane". By

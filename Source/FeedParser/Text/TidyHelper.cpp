@@ -1,6 +1,7 @@
 #include "FeedParser/Text/TidyHelper.h"
 
 #include "FeedParser/Text/Bounds.h"
+#include "Foundation/InstalledTree.h"
 #include "Foundation/Logger.h"
 #include "Foundation/ProcessBeginning.h"
 #include "Foundation/RunLoop.h"
@@ -24,6 +25,7 @@ namespace Orvane::FeedParser {
 
 using Foundation::FileDescriptorSource;
 using Foundation::gWarn;
+using Foundation::InstalledTree;
 using Foundation::ProcessBeginning;
 using Foundation::RunLoop;
 using Foundation::UniqueFD;
@@ -74,7 +76,9 @@ TidyHelper::~TidyHelper() {
 std::string TidyHelper::getPath() {
     const char* set = std::getenv("ORVANE_PROGRAMS");
     if (set && *set) return std::string(set) + kProgram;
-    const std::string installed = std::string(ORVANE_INSTALLED_PROGRAMS) + kProgram;
+    const std::string installed =
+        InstalledTree::findDirectory(ORVANE_PROGRAMS_FROM_LIBRARY, ORVANE_INSTALLED_PROGRAMS) +
+        kProgram;
     if (access(installed.c_str(), X_OK) == 0) return installed;
     const std::string beside = pathBesideProgram();
     return access(beside.c_str(), X_OK) == 0 ? beside : installed;
