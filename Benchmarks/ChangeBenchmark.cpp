@@ -6,26 +6,21 @@
 // and has told its observers. The bare side makes and sends the same arguments by sd-bus in a
 // process of its own; here they are read, as the other side needs them, and nothing is done.
 
+#include "Benchmarks/BareSignal.h"
 #include "Benchmarks/Measure.h"
 #include "Foundation/AutoreleasePool.h"
 #include "Foundation/Bus.h"
 #include "Foundation/BusCenter.h"
-#include "Foundation/Clock.h"
 #include "Foundation/NotificationCenter.h"
 #include "Model/EntryCore.h"
 #include "Model/Schema.h"
 #include "SQLite/Database.h"
 #include "SQLite/TableOf.h"
-#include "Support/PipedChild.h"
 #include "Support/PrivateBus.h"
 #include "Support/TempDir.h"
 #include "Support/TurnUntil.h"
 
-#include <systemd/sd-bus.h>
-
 #include <cstdio>
-#include <cstdlib>
-#include <ctime>
 #include <stdexcept>
 #include <string>
 #include <vector>
@@ -41,23 +36,7 @@ constexpr int kRows = 100'000;
 constexpr int kRounds = 7;
 constexpr const char* kProgram = "/proc/self/exe";
 
-/// The machine's own time, which is the same in all processes.
-double now() {
-    timespec time = {};
-    clock_gettime(CLOCK_MONOTONIC, &time);
-    return static_cast<double>(time.tv_sec) + static_cast<double>(time.tv_nsec) / 1e9;
-}
-
-void tellStart() {
-    std::printf("%.9f\n", now());
-    std::fflush(stdout);
-}
-
-void check(int result) {
-    if (result < 0) throw std::runtime_error("sd-bus failed");
-}
-
-// The processes that post.
+// The process that posts.
 
 void write(const char* path) {
     const AutoreleasePool pool;
@@ -65,62 +44,21 @@ void write(const char* path) {
     SQLite::Database::initialize();
     gDatabase->open(path, true);
     gDatabase->setPostsNotifications(true);
-    gDatabase->execute("UPDATE Entries SET read = 1 - read");
-    tellStart();
-    gDatabase->_postChangeNotification();
-    Bus::user().flush(60);
-}
-
-void appendChanges(sd_bus_message* signal) {
-    check(sd_bus_message_append(signal, "ss", "name", "object"));
-    check(sd_bus_message_open_container(signal, 'a', "{sv}"));
-    check(sd_bus_message_open_container(signal, 'e', "sv"));
-    check(sd_bus_message_append_basic(signal, 's', EntryCore::kTableName));
-    check(sd_bus_message_open_container(signal, 'v', "a{sv}"));
-    check(sd_bus_message_open_container(signal, 'a', "{sv}"));
-    for (int row = 1; row <= kRows; ++row) {
-        check(sd_bus_message_append(signal, "{sv}", std::to_string(row).c_str(), "x",
-                                    static_cast<std::int64_t>(23)));
+    while (Benchmarks::isAskedAgain()) {
+        gDatabase->execute("UPDATE Entries SET read = 1 - read");
+        Benchmarks::tellStart();
+        gDatabase->_postChangeNotification();
+        Bus::user().flush(60);
     }
-    for (int i = 0; i < 4; ++i) {
-        check(sd_bus_message_close_container(signal));
-    }
-}
-
-sd_bus* openBus(const char* address) {
-    sd_bus* bus = nullptr;
-    check(sd_bus_new(&bus));
-    check(sd_bus_set_address(bus, address));
-    check(sd_bus_set_bus_client(bus, 1));
-    check(sd_bus_start(bus));
-    return bus;
-}
-
-void signal(const char* address) {
-    sd_bus* bus = openBus(address);
-    tellStart();
-    sd_bus_message* message = nullptr;
-    check(sd_bus_message_new_signal(bus, &message, BusCenter::kPath, "bare.Interface", "Posted"));
-    appendChanges(message);
-    check(sd_bus_send(bus, message, nullptr));
-    sd_bus_message_unref(message);
-    sd_bus_flush_close_unref(bus);
 }
 
 // The process that receives.
 
-/// The seconds since the time that a child told.
-double secondsSinceStart(Support::PipedChild& child, double end) {
-    const std::string start = child.readLine();
-    if (start.empty() || child.wait() != 0) throw std::runtime_error("a child failed");
-    return end - std::strtod(start.c_str(), nullptr);
-}
-
 /// A reader with all rows in its cache.
 class Reader {
  public:
-    explicit Reader(std::string path) : mPath(std::move(path)) {
-        gDatabase->open(mPath.c_str(), false);
+    explicit Reader(const std::string& path) : mWriter({kProgram, "write", path}) {
+        gDatabase->open(path.c_str(), false);
         NotificationCenter::getLocal()->addObserver(
             &mReceiver, SQLite::Table::kRowsChangedNotification, TableOf<EntryCore>::instance());
     }
@@ -135,12 +73,12 @@ class Reader {
     double measure() {
         load();
         mEnd = 0;
-        Support::PipedChild writer({kProgram, "write", mPath});
+        mWriter.writeLine("");
         if (!Support::turnUntil([this] { return mEnd != 0; })) throw std::runtime_error("no news");
         for (const Ref<EntryCore>& row : mRows) {
             if (row->isLoaded()) throw std::runtime_error("a row is out of date");
         }
-        return secondsSinceStart(writer, mEnd);
+        return Benchmarks::secondsSinceStart(mWriter, mEnd);
     }
 
  private:
@@ -154,61 +92,12 @@ class Reader {
         }
         if (mRows.size() != kRows) throw std::runtime_error("rows are missing");
     }
-    void receive(Notification*) { mEnd = now(); }
+    void receive(Notification*) { mEnd = Benchmarks::machineSeconds(); }
 
-    std::string mPath;
+    Support::PipedChild mWriter;
     std::vector<Ref<EntryCore>> mRows;
     double mEnd = 0;
     Orvane::MethodReceiver<Notification, Reader> mReceiver{this, &Reader::receive};
-};
-
-/// The same with nothing between the program and the library.
-class BareReader {
- public:
-    explicit BareReader(std::string address) : mAddress(std::move(address)) {
-        mBus = openBus(mAddress.c_str());
-        check(sd_bus_match_signal(mBus, nullptr, nullptr, nullptr, "bare.Interface", "Posted",
-                                  receive, this));
-    }
-    ~BareReader() { sd_bus_flush_close_unref(mBus); }
-    BareReader(const BareReader&) = delete;
-    BareReader& operator=(const BareReader&) = delete;
-
-    double measure() {
-        mEnd = 0;
-        Support::PipedChild sender({kProgram, "signal", mAddress});
-        while (mEnd == 0) {
-            if (sd_bus_process(mBus, nullptr) == 0) sd_bus_wait(mBus, UINT64_MAX);
-        }
-        return secondsSinceStart(sender, mEnd);
-    }
-
- private:
-    static int receive(sd_bus_message* message, void* self, sd_bus_error*) {
-        if (countRows(message) == kRows) static_cast<BareReader*>(self)->mEnd = now();
-        return 0;
-    }
-    static int countRows(sd_bus_message* message) {
-        int count = 0;
-        long long sum = 0;
-        const char* key = nullptr;
-        sd_bus_message_skip(message, "ss");
-        sd_bus_message_enter_container(message, 'a', "{sv}");
-        sd_bus_message_enter_container(message, 'e', "sv");
-        sd_bus_message_read_basic(message, 's', &key);
-        sd_bus_message_enter_container(message, 'v', "a{sv}");
-        sd_bus_message_enter_container(message, 'a', "{sv}");
-        std::int64_t action = 0;
-        for (; sd_bus_message_read(message, "{sv}", &key, "x", &action) > 0; ++count) {
-            sum += std::atoll(key) + action;
-        }
-        Benchmarks::keep(sum);
-        return count;
-    }
-
-    std::string mAddress;
-    sd_bus* mBus = nullptr;
-    double mEnd = 0;
 };
 
 void makeFile(const std::string& path) {
@@ -229,12 +118,13 @@ void compareBoth() {
     const std::string path = directory / "Database.sqlite3";
     makeFile(path);
     Reader reader(path);
-    BareReader bare(bus.getAddress());
+    Benchmarks::BareSignal bare(bus.getAddress());
+    Support::PipedChild sender({kProgram, "signal", bus.getAddress()});
     std::vector<double> measured;
     std::vector<double> floor;
     for (int i = 0; i < kRounds; ++i) {
         measured.push_back(reader.measure());
-        floor.push_back(bare.measure());
+        floor.push_back(bare.measure(sender, kRows));
     }
     const Benchmarks::Comparison c = {Benchmarks::median(measured), Benchmarks::median(floor)};
     Benchmarks::report("a change of a row to another process", c, kRows, "a bare signal");
@@ -248,7 +138,7 @@ int main(int argc, char** argv) try {
     if (role == "write") {
         write(argv[2]);
     } else if (role == "signal") {
-        signal(argv[2]);
+        Benchmarks::BareSignal::serve(argv[2], EntryCore::kTableName, kRows);
     } else {
         compareBoth();
     }

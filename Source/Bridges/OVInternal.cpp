@@ -4,6 +4,7 @@
 #include "Foundation/Guard.h"
 #include "Foundation/NetException.h"
 #include "Foundation/RunLoop.h"
+#include "Model/ClientSession.h"
 #include "SQLite/Cursor.h"
 #include "SQLite/Database.h"
 
@@ -53,13 +54,16 @@ Core& OVInternal::useCore() const {
 }
 
 void OVInternal::catchUp() {
+    Orvane::ClientSession::catchUpIfUnturned();
+    catchUpWithConnection();
+}
+
+void OVInternal::catchUpWithConnection() {
     if (!gDatabase || !gDatabase->isOpen()) return;
     const std::uint32_t generation = gDatabase->getGeneration();
-    if (generation != sGeneration) {
-        sGeneration = generation;
-        reattachAll();
-    }
-    gDatabase->refreshIfUnturned();
+    if (generation == sGeneration) return;
+    sGeneration = generation;
+    reattachAll();
 }
 
 bool OVInternal::isOutdated() const {

@@ -32,6 +32,9 @@ class OVInternal : Foundation::Uncopyable {
     /// Comes before every use: sees to it that objects stand for rows of the database that is open
     /// now and, where nobody turns the run loop, that rows are not out of date.
     static void catchUp();
+    /// The first half of that, for the middle of an operation: nothing that was read becomes out of
+    /// date.
+    static void catchUpWithConnection();
 
  protected:
     /// The order in which objects find their rows again.

@@ -36,7 +36,7 @@ OVObject* keepInPool(std::shared_ptr<OVObject> object) {
 /// The object of a row that has got one by now, or else what `make` makes.
 template <class Make>
 OVObject* madeFor(Core* row, Make make) {
-    OVInternal::catchUp();
+    OVInternal::catchUpWithConnection();
     if (OVObject* present = row->getExistingOVObject()) return present;
     return keepInPool(make());
 }

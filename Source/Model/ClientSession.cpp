@@ -5,6 +5,7 @@
 #include "Foundation/DistributedNotificationCenter.h"
 #include "Foundation/Logger.h"
 #include "Foundation/Number.h"
+#include "Foundation/RunLoop.h"
 #include "Foundation/String.h"
 #include "Foundation/URL.h"
 #include "Model/AgentLink.h"
@@ -46,6 +47,9 @@ void reopen() {
     openReadOnly();
 }
 
+/// The process's own; never destroyed.
+ClientSession* sSession = nullptr;
+
 /// Has the agent check the database or make it anew, and opens it again.
 void fixDatabase(int code) {
     // What reads a file stands in the way of its repair.
@@ -62,7 +66,7 @@ void ClientSession::open() {
     if (gDatabase->isOpen()) return;
     const Foundation::AutoreleasePool pool;
     gLog.log("***** Opening client Orvane session *****");
-    static auto* const sSession = new ClientSession;
+    if (!sSession) sSession = new ClientSession;
     try {
         sSession->openDatabase();
         sSession->observe();
@@ -101,6 +105,23 @@ void ClientSession::observe() {
     distributed->removeObserver(&mReplaced);
     local->addObserver(&mBroke, Database::kDatabaseFatalErrorNotification, gDatabase);
     distributed->addObserver(&mReplaced, Database::kDatabaseReplacedNotification, nullptr);
+}
+
+void ClientSession::catchUpIfUnturned() {
+    if (!gDatabase || Foundation::RunLoop::isInsideCallback()) return;
+    if (sSession) sSession->follow();
+    gDatabase->refreshIfUnturned();
+}
+
+void ClientSession::follow() {
+    if (gDatabase->isInTransaction()) return;
+    gDatabase->announceFatalError();
+    if (!gDatabase->isOpen()) return open();
+    if (!gDatabase->isReplaced()) return;
+    gLog.log("***** Database was replaced, and nobody turns the run loop ...");
+    gDatabase->close(true);
+    // It may be about to be made still, which the agent is waited for.
+    openDatabase();
 }
 
 void ClientSession::databaseBroke(Notification* notification) {

@@ -14,6 +14,10 @@ class ClientSession : Foundation::Uncopyable {
     /// Opens the database of the process, unless it is open already. If that cannot be, reports why
     /// and throws a `std::exception` that says nothing more; the database is then closed.
     static void open();
+    /// For whoever turns no run loop, outside of all its callbacks, and is not told: sees to it
+    /// that what is open is the database that there is now, and what was read of it up to date. A
+    /// session that could not go on tries again. Throws as `open` does, and `SQLite::Exception`.
+    static void catchUpIfUnturned();
 
  private:
     using Receiver = MethodReceiver<Foundation::Notification, ClientSession>;
@@ -21,6 +25,7 @@ class ClientSession : Foundation::Uncopyable {
     ClientSession() = default;
 
     void openDatabase();
+    void follow();
     void observe();
     void databaseBroke(Foundation::Notification* notification);
     void databaseWasReplaced(Foundation::Notification* notification);

@@ -110,6 +110,11 @@ class Database : public DatabaseNotifications, Foundation::Uncopyable {
     /// read of rows if another process has changed the file since the last call. Who turns the loop
     /// is told of that, but others are not. Throws `Exception`.
     void refreshIfUnturned();
+    /// Whether the place of the open file has another file now, as after `kDatabaseReplaced`, of
+    /// which who turns no run loop is not told. False while there is none.
+    bool isReplaced() const;
+    /// Announces a fatal error at once that is to be announced in the loop's next turn.
+    void announceFatalError();
     /// Tells the clients that another file has taken this one's place.
     void postReplacedNotification();
 

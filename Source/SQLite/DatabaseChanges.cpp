@@ -10,6 +10,7 @@
 #include "SQLite/Table.h"
 
 #include <sqlite3.h>
+#include <unistd.h>
 
 #include <utility>
 
@@ -120,6 +121,20 @@ void Database::refreshIfUnturned() {
     for (Table* table : mTables) {
         table->_rolledBack();
     }
+}
+
+bool Database::isReplaced() const {
+    if (!mOpen || !mLocation.get()) return false;
+    int hasMoved = 0;
+    sqlite3_file_control(mDB, nullptr, SQLITE_FCNTL_HAS_MOVED, &hasMoved);
+    return hasMoved != 0 && access(mLocation->getFileSystemRepresentation().c_str(), F_OK) == 0;
+}
+
+void Database::announceFatalError() {
+    if (!mFatalTimer.isRunning()) return;
+    mFatalTimer.stop();
+    const AutoreleasePool pool;
+    _postFatalErrorNotification();
 }
 
 void Database::postReplacedNotification() {

@@ -65,6 +65,17 @@ std::string PipedChild::readLine() {
     return line;
 }
 
+void PipedChild::writeLine(const std::string& line) {
+    const std::string bytes = line + "\n";
+    std::size_t written = 0;
+    while (written < bytes.size()) {
+        const ssize_t size = write(mInput.get(), bytes.data() + written, bytes.size() - written);
+        // What it has not got it does not answer.
+        if (size <= 0) return;
+        written += static_cast<std::size_t>(size);
+    }
+}
+
 void PipedChild::closeInput() {
     mInput.close();
 }

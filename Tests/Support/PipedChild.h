@@ -22,6 +22,8 @@ class PipedChild {
     /// Waits for the next line that it writes, and gives it without its end. Empty when it has
     /// closed its output, and when it is silent for two minutes.
     std::string readLine();
+    /// Writes a line to its input. REQUIRES: SIGPIPE is ignored, for it may have ended.
+    void writeLine(const std::string& line);
     /// Ends its input.
     void closeInput();
     /// Ends it with SIGKILL. What it has written can still be read.
