@@ -1,77 +1,130 @@
 #include "CommandLine.h"
 
+#include "AddVerb.h"
+#include "EntriesVerb.h"
+#include "Failure.h"
+#include "FeedsVerb.h"
+#include "HelpText.h"
+#include "HelpVerb.h"
 #include "InspectVerb.h"
+#include "Messages.h"
+#include "Output.h"
+#include "Pager.h"
+#include "RefreshVerb.h"
+#include "RemoveVerb.h"
+#include "SetVerb.h"
+#include "ShowVerb.h"
+#include "StateVerb.h"
+#include "StatusVerb.h"
+#include "Trouble.h"
+#include "VerbNames.h"
+#include "VersionVerb.h"
 
-#include <CLI/CLI.hpp>
+#include <Orvane/OVException.h>
 
-#include <cstdio>
 #include <exception>
-#include <string>
 
 namespace Commands {
 
 namespace {
 
-constexpr const char* kExitCodes =
-    "Exit status: 0 done, 1 nothing matched, 2 wrong usage, 3 unknown or ambiguous name,\n"
-    "4 partly failed, 5 failed, 6 needs a login, 7 agent not reachable, 8 database not usable.";
-
-/// The program's name with that of the verb which was begun, if one was.
-std::string nameOf(const CLI::App& app) {
-    std::string name = app.get_name();
-    for (const CLI::App* verb : app.get_subcommands()) {
-        name += ' ' + verb->get_name();
-    }
-    return name;
-}
-
-void say(const std::string& line) {
-    std::fputs((line + '\n').c_str(), stderr);
-}
-
-/// Shows the help that was asked for, or says what is wrong.
-ExitStatus handle(const CLI::App& app, const CLI::ParseError& error) {
-    if (error.get_exit_code() == static_cast<int>(CLI::ExitCodes::Success)) {
-        return app.exit(error) == 0 ? ExitStatus::Done : ExitStatus::Usage;
-    }
-    const std::string name = nameOf(app);
-    say(name + ": " + error.what());
-    say("See \"" + name + " --help\".");
-    return ExitStatus::Usage;
-}
-
-ExitStatus runGuarded(const CLI::App& app, Verb& verb) {
+/// Says what ended a verb, or kept it from beginning.
+ExitStatus report(const std::string& verb) {
     try {
-        return verb.run();
+        throw;
+    } catch (const Failure& failure) {
+        Messages::complain(verb, failure.what());
+        if (failure.getStatus() == ExitStatus::Usage) {
+            Messages::say("See \"orvane " + (verb.empty() ? "" : verb + ' ') + "--help\".");
+        }
+        return failure.getStatus();
+    } catch (const OVException& failure) {
+        if (failure.error()) {
+            const Failure named = Trouble::ofChange(failure.what(), *failure.error());
+            Messages::complain(verb, named.what());
+            return named.getStatus();
+        }
+        Messages::complain(verb, failure.what());
     } catch (const std::exception& failure) {
-        say(nameOf(app) + ": " + failure.what());
-        return ExitStatus::Failed;
+        Messages::complain(verb, failure.what());
     }
+    return ExitStatus::Failed;
 }
 
 }  // namespace
 
 CommandLine::CommandLine() {
-    mVerbs.push_back(std::make_unique<InspectVerb>());
+    add<AddVerb>();
+    add<RemoveVerb>();
+    add<SetVerb>();
+    add<FeedsVerb>();
+    add<EntriesVerb>();
+    add<ShowVerb>();
+    add<StateVerb>(StateVerb::Kind::Mark);
+    add<StateVerb>(StateVerb::Kind::Flag);
+    add<StateVerb>(StateVerb::Kind::Unflag);
+    add<RefreshVerb>();
+    add<StatusVerb>();
+    add<InspectVerb>();
+    add<VersionVerb>();
+    add<HelpVerb>([this] { return specs(); });
 }
 
-ExitStatus CommandLine::run(int count, const char* const* arguments) {
-    CLI::App app("Feeds, from the command line.", "orvane");
-    app.set_help_flag("-h,--help", "Show this help");
-    app.require_subcommand(1);
-    app.footer(kExitCodes);
-    for (const auto& verb : mVerbs) {
-        verb->addOptions(*app.add_subcommand(verb->getName(), verb->getSummary()));
-    }
+ExitStatus CommandLine::run(const std::vector<std::string>& words) {
     try {
-        app.parse(count, arguments);
-    } catch (const CLI::ParseError& error) {
-        return handle(app, error);
+        if (words.empty()) throw Failure(ExitStatus::Usage, "VERB is missing");
+        if (words[0].starts_with('-')) return runProgram(words[0]);
+        return runVerb(verbOf(words[0]), {words.begin() + 1, words.end()});
+    } catch (const std::exception&) {
+        return report({});
     }
+}
+
+ExitStatus CommandLine::runProgram(const std::string& option) const {
+    if (option == "-h") {
+        Output::write(HelpText::program(specs()));
+    } else if (option == "--help") {
+        Pager::show(HelpText::programManual(specs()));
+    } else if (option == "--version") {
+        return runVerb(verbOf("version"), {});
+    } else {
+        throw Failure(ExitStatus::Usage, "there is no option " + option);
+    }
+    return ExitStatus::Done;
+}
+
+ExitStatus CommandLine::runVerb(Verb& verb, const std::vector<std::string>& words) const {
+    const VerbSpec& spec = verb.getSpec();
+    try {
+        const Arguments arguments(spec, words);
+        if (arguments.wantsShortHelp()) {
+            Output::write(HelpText::verb(spec));
+            return ExitStatus::Done;
+        }
+        if (arguments.wantsManual()) {
+            Pager::show(HelpText::verbManual(spec));
+            return ExitStatus::Done;
+        }
+        return verb.run(arguments);
+    } catch (const std::exception&) {
+        return report(spec.name);
+    }
+}
+
+std::vector<const VerbSpec*> CommandLine::specs() const {
+    std::vector<const VerbSpec*> all;
     for (const auto& verb : mVerbs) {
-        if (app.got_subcommand(verb->getName())) return runGuarded(app, *verb);
+        all.push_back(&verb->getSpec());
     }
-    return ExitStatus::Usage;  // not reached: one of them is required
+    return all;
+}
+
+Verb& CommandLine::verbOf(const std::string& name) const {
+    const VerbSpec& spec = VerbNames::find(name, specs());
+    for (const auto& verb : mVerbs) {
+        if (&verb->getSpec() == &spec) return *verb;
+    }
+    throw Failure(ExitStatus::Usage, "there is no verb \"" + name + '"');
 }
 
 }  // namespace Commands

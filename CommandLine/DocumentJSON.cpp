@@ -1,5 +1,6 @@
 #include "DocumentJSON.h"
 
+#include "JSONText.h"
 #include "TimeText.h"
 
 #include <nlohmann/json.hpp>
@@ -154,19 +155,6 @@ JSON infoOf(const OVDocument& document) {
             {"defaultTimePublished", json(document.defaultTimePublished)}};
 }
 
-/// Escapes the characters beyond ASCII that many programs take for the end of a line as well. They
-/// stand in strings alone.
-void escapeLineEnds(std::string& line) {
-    constexpr std::pair<std::string_view, std::string_view> kLineEnds[] = {
-        {"\u0085", "\\u0085"}, {"\u2028", "\\u2028"}, {"\u2029", "\\u2029"}};
-    for (const auto& [character, escape] : kLineEnds) {
-        for (std::size_t at = line.find(character); at != std::string::npos;
-             at = line.find(character, at + escape.size())) {
-            line.replace(at, character.size(), escape);
-        }
-    }
-}
-
 }  // namespace
 
 std::string DocumentJSON::line(const std::string& file, const OVDocument& document) {
@@ -181,7 +169,7 @@ std::string DocumentJSON::line(const std::string& file, const OVDocument& docume
                          {"page", json(document.page)},
                          {"friend", json(document.person)}};
     std::string line = object.dump(-1, ' ', false, JSON::error_handler_t::replace) + '\n';
-    escapeLineEnds(line);
+    JSONText::escapeLineEnds(line);
     return line;
 }
 

@@ -1,10 +1,8 @@
 #pragma once
 
+#include "Arguments.h"
 #include "ExitStatus.h"
-
-namespace CLI {
-class App;
-}
+#include "VerbSpec.h"
 
 namespace Commands {
 
@@ -16,13 +14,11 @@ class Verb {
     Verb(const Verb&) = delete;
     Verb& operator=(const Verb&) = delete;
 
-    virtual const char* getName() const = 0;
-    /// What it does, in a few words, for the list of all verbs.
-    virtual const char* getSummary() const = 0;
-    /// Declares options and arguments, which parsing stores here, and the rest of the help.
-    virtual void addOptions(CLI::App& app) = 0;
-    /// Does it. May throw what derives from `std::exception`: the whole of it has failed then.
-    virtual ExitStatus run() = 0;
+    /// Its table, which lives as long as it does.
+    virtual const VerbSpec& getSpec() const = 0;
+    /// Does it. Throws `Failure`, or whatever else derives from `std::exception`, if the whole of
+    /// it has failed.
+    virtual ExitStatus run(const Arguments& arguments) = 0;
 };
 
 }  // namespace Commands

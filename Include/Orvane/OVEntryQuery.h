@@ -28,6 +28,10 @@ struct OVEntryQuery {
     /// Only of these feeds; all of the client's if there are none. One that is not the client's,
     /// and null, has no entries.
     std::vector<std::shared_ptr<OVFeed>> feeds;
+    /// Only those whose identifier begins with this.
+    std::string identifierPrefix;
+    /// Only those of this web page.
+    std::string alternateURL;
     /// Only those that the user has read, or has not.
     std::optional<bool> read;
     /// Only those that the user has flagged, or has not.

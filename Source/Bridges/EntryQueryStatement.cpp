@@ -43,6 +43,7 @@ EntryQueryStatement::EntryQueryStatement(const ClientCore& client, const OVEntry
     : mClient(client), mQuery(query) {
     mBindings.emplace_back([&client](Query& q, int i) { q.bind(i, &client); });
     chooseFeeds();
+    chooseNames();
     chooseStates();
     chooseDates();
     chooseTexts();
@@ -68,6 +69,20 @@ void EntryQueryStatement::chooseFeeds() {
     list += ']';
     add("s.rowID in (select value from json_each(?))",
         {[list](Query& q, int i) { q.bind(i, list.c_str(), true); }});
+}
+
+void EntryQueryStatement::chooseNames() {
+    const auto require = [this](const char* condition, const std::string& text) {
+        if (text.empty()) return;
+        const Ref<String> checked = stringOf(text);
+        add(condition, {[text](Query& q, int i) { q.bind(i, text.c_str(), true); }});
+    };
+    // Behind all that begin with the prefix stands what has the last character there is added.
+    require("e.identifier>=?", mQuery.identifierPrefix);
+    if (!mQuery.identifierPrefix.empty()) {
+        require("e.identifier<?", mQuery.identifierPrefix + "\U0010FFFF");
+    }
+    require("e.alternateUrl=?", mQuery.alternateURL);
 }
 
 void EntryQueryStatement::chooseStates() {

@@ -32,6 +32,7 @@ class EntryQueryStatement {
     using Binding = std::function<void(SQLite::Query&, int)>;
 
     void chooseFeeds();
+    void chooseNames();
     void chooseStates();
     void chooseDates();
     void chooseTexts();

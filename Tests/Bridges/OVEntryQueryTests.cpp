@@ -96,6 +96,26 @@ TEST_F(OVEntryQueryTest, LeavesOutWhatHasExpired) {
     EXPECT_EQ(find({}), "dcba");
 }
 
+TEST_F(OVEntryQueryTest, ChoosesByTheBeginningOfIdentifiers) {
+    set("a", "identifier='ab1'");
+    set("b", "identifier='ab2'");
+    set("c", "identifier='ac'");
+    const auto begins = [](const char* text) {
+        return by([&](auto& q) { q.identifierPrefix = text; });
+    };
+    EXPECT_EQ(find(begins("ab")), "ab2ab1");
+    EXPECT_EQ(find(begins("ab1")), "ab1");
+    EXPECT_EQ(find(begins("a")), "acab2ab1");
+    EXPECT_EQ(find(begins("%")), "");
+    EXPECT_EQ(planOf(begins("ab")).find("SCAN e"), std::string::npos);
+}
+
+TEST_F(OVEntryQueryTest, ChoosesByTheWebPage) {
+    set("b", "alternateUrl='http://e.org/b'");
+    EXPECT_EQ(find(by([](auto& q) { q.alternateURL = "http://e.org/b"; })), "b");
+    EXPECT_EQ(find(by([](auto& q) { q.alternateURL = "http://e.org/"; })), "");
+}
+
 TEST_F(OVEntryQueryTest, ChoosesByState) {
     set("a", "read=1");
     set("b", "flagged=1");
