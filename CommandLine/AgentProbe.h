@@ -2,6 +2,9 @@
 
 namespace Commands::AgentProbe {
 
+/// The agent's name on the message bus.
+inline constexpr const char* kName = "com.tarnwick.orvane.ipc";
+
 enum class State {
     Runs,
     Stopped,  ///< it is started when something is asked of it

@@ -1,11 +1,15 @@
 #include "CommandLine.h"
 
 #include "AddVerb.h"
+#include "CompletionVerb.h"
+#include "DoctorVerb.h"
 #include "EntriesVerb.h"
+#include "ExportVerb.h"
 #include "Failure.h"
 #include "FeedsVerb.h"
 #include "HelpText.h"
 #include "HelpVerb.h"
+#include "ImportVerb.h"
 #include "InspectVerb.h"
 #include "Messages.h"
 #include "Output.h"
@@ -19,6 +23,7 @@
 #include "Trouble.h"
 #include "VerbNames.h"
 #include "VersionVerb.h"
+#include "WatchVerb.h"
 
 #include <Orvane/OVException.h>
 
@@ -57,6 +62,8 @@ CommandLine::CommandLine() {
     add<AddVerb>();
     add<RemoveVerb>();
     add<SetVerb>();
+    add<ImportVerb>();
+    add<ExportVerb>();
     add<FeedsVerb>();
     add<EntriesVerb>();
     add<ShowVerb>();
@@ -64,8 +71,11 @@ CommandLine::CommandLine() {
     add<StateVerb>(StateVerb::Kind::Flag);
     add<StateVerb>(StateVerb::Kind::Unflag);
     add<RefreshVerb>();
+    add<WatchVerb>();
     add<StatusVerb>();
+    add<DoctorVerb>();
     add<InspectVerb>();
+    add<CompletionVerb>([this] { return specs(); });
     add<VersionVerb>();
     add<HelpVerb>([this] { return specs(); });
 }

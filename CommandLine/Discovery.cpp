@@ -4,7 +4,6 @@
 #include "Failure.h"
 
 #include <Orvane/OVErrorCode.h>
-#include <Orvane/OVFeed.h>
 #include <Orvane/OVFeedURLUtils.h>
 
 #include <algorithm>
@@ -28,6 +27,11 @@ bool hasScheme(const std::string& word) {
 
 std::string fileURL(const std::string& path) {
     return "file://" + std::filesystem::absolute(path).lexically_normal().string();
+}
+
+/// Whether something came that is no feed.
+bool isOther(const OVError& error) {
+    return error.domain() == OVErrorDomain && error.code() == OVNotAFeedError;
 }
 
 OVError notAFeed(const std::string& url) {
@@ -54,26 +58,29 @@ std::vector<std::string> Discovery::sourcesOf(const std::string& word) {
     return {hasScheme(word) ? word : "https://" + word};
 }
 
+Discovery::Fetched Discovery::fetch(const std::string& url) {
+    Fetched fetched;
+    fetched.feed = OVFeed::create(url);
+    if (!fetched.feed) throw Failure(ExitStatus::Usage, "feeds cannot be fetched from " + url);
+    OVFeed& feed = *fetched.feed;
+    if (!feed.refresh(&fetched.error)) return fetched;
+    if (EventLoop::turnUntil([&] { return !feed.isRefreshing(); }, kPatience)) {
+        fetched.error = feed.lastError();
+    } else {
+        fetched.error = OVError(OVURLErrorDomain, OVURLErrorTimedOut);
+        fetched.error->setDescription(url + " did not answer.");
+    }
+    fetched.isDocument = !fetched.error || isOther(*fetched.error);
+    return fetched;
+}
+
 Discovery::Result Discovery::find(const std::string& url) {
-    const std::shared_ptr<OVFeed> feed = OVFeed::create(url);
-    if (!feed) throw Failure(ExitStatus::Usage, "feeds cannot be fetched from " + url);
+    const Fetched fetched = fetch(url);
     Result result;
-    if (!feed->refresh(&result.error)) return result;
-    const bool hasEnded = EventLoop::turnUntil([&] { return !feed->isRefreshing(); }, kPatience);
-    if (!hasEnded) {
-        result.error = OVError(OVURLErrorDomain, OVURLErrorTimedOut);
-        result.error->setDescription(url + " did not answer.");
-        return result;
-    }
-    result.error = feed->lastError();
-    if (!result.error) {
-        result.feeds = {{url, feed->title().value_or("")}};
-        return result;
-    }
-    const bool isOther =
-        result.error->domain() == OVErrorDomain && result.error->code() == OVNotAFeedError;
-    if (!isOther) return result;
-    const auto document = feed->XMLData();
+    result.error = fetched.error;
+    if (!fetched.error) result.feeds = {{url, fetched.feed->title().value_or("")}};
+    if (!fetched.error || !fetched.isDocument) return result;
+    const auto document = fetched.feed->XMLData();
     if (document) result.feeds = linksOf(OVDocument::read(*document, url));
     result.error = result.feeds.empty() ? std::optional(notAFeed(url)) : std::nullopt;
     return result;

@@ -1,6 +1,8 @@
 #include "HelpVerb.h"
 
 #include "HelpText.h"
+#include "ManualPage.h"
+#include "Output.h"
 #include "Pager.h"
 #include "VerbNames.h"
 
@@ -12,6 +14,7 @@ const VerbSpec& HelpVerb::getSpec() const {
         .summary = "show the manual of the program or of a verb",
         .operands = "[VERB]",
         .most = 1,
+        .options = {{"mdoc", 0, "", "Write the manual page, in mdoc(7)"}},
         .details = "The same as \"orvane --help\" and \"orvane VERB --help\".",
         .examples = {"help entries"},
     };
@@ -20,10 +23,15 @@ const VerbSpec& HelpVerb::getSpec() const {
 
 ExitStatus HelpVerb::run(const Arguments& arguments) {
     const Verbs verbs = mVerbs();
-    if (arguments.operands().empty()) {
+    const bool isPage = arguments.has("mdoc");
+    const std::vector<std::string>& words = arguments.operands();
+    if (isPage) {
+        Output::write(words.empty() ? ManualPage::program(verbs)
+                                    : ManualPage::verb(VerbNames::find(words[0], verbs)));
+    } else if (words.empty()) {
         Pager::show(HelpText::programManual(verbs));
     } else {
-        Pager::show(HelpText::verbManual(VerbNames::find(arguments.operands()[0], verbs)));
+        Pager::show(HelpText::verbManual(VerbNames::find(words[0], verbs)));
     }
     return ExitStatus::Done;
 }

@@ -1,11 +1,13 @@
 #include "InspectVerb.h"
 
+#include "Discovery.h"
 #include "DocumentJSON.h"
 #include "DocumentText.h"
 #include "Failure.h"
 #include "InputFile.h"
 #include "Messages.h"
 #include "Output.h"
+#include "Trouble.h"
 
 #include <Orvane/OVDocument.h>
 #include <Orvane/OVException.h>
@@ -25,10 +27,23 @@ void checkBase(const std::string& url) {
     }
 }
 
+bool isOfTheWeb(const std::string& file) {
+    return file.starts_with("http://") || file.starts_with("https://");
+}
+
+std::string fetched(const std::string& url) {
+    const Discovery::Fetched result = Discovery::fetch(url);
+    if (!result.isDocument) throw Trouble::ofChange(url, result.error);
+    return result.feed->XMLData().value_or("");
+}
+
 /// None, and a message to the user, if the file cannot be read.
 std::optional<std::string> contentOf(const std::string& file) {
     try {
-        return InputFile::read(file);
+        return isOfTheWeb(file) ? fetched(file) : InputFile::read(file);
+    } catch (const Failure& failure) {
+        Messages::complain("inspect", failure.what());
+        return std::nullopt;
     } catch (const std::system_error& failure) {
         Messages::complain("inspect", failure.what());
         return std::nullopt;
@@ -40,8 +55,9 @@ bool inspect(const std::string& file, const Arguments& arguments) {
     if (!bytes) return false;
     const auto contents =
         arguments.has("tidied") ? OVDocument::Contents::Tidied : OVDocument::Contents::AsStored;
+    const std::string own = isOfTheWeb(file) ? file : "";
     const OVDocument document =
-        OVDocument::read(*bytes, arguments.value("base").value_or(""), contents);
+        OVDocument::read(*bytes, arguments.value("base").value_or(own), contents);
     const bool isJSON = arguments.has("json") || arguments.has("jsonl");
     Output::write(isJSON ? DocumentJSON::line(file, document) : DocumentText::text(file, document));
     return true;
@@ -53,7 +69,7 @@ const VerbSpec& InspectVerb::getSpec() const {
     static const VerbSpec sSpec{
         .name = "inspect",
         .summary = "show what documents are read as",
-        .operands = "FILE...",
+        .operands = "FILE|URL...",
         .fewest = 1,
         .most = VerbSpec::kAny,
         .kind = WordKind::File,
@@ -64,7 +80,8 @@ const VerbSpec& InspectVerb::getSpec() const {
                      "Contents of entries as they are shown, not as they are stored"}},
         .details =
             "A document may be a feed, a single entry, a web page, or a person's description, "
-            "of whatever quality. \"-\" is standard input. A file that cannot be read is told "
+            "of whatever quality. \"-\" is standard input, and what begins with http:// or "
+            "https:// is fetched. A file that cannot be read is told "
             "about on standard error, the others are shown all the same, and the exit status "
             "is 4.",
         .examples = {"inspect feed.xml", "inspect --json *.rss"},

@@ -1,6 +1,7 @@
 #include "Session.h"
 
 #include "Messages.h"
+#include "SettingKeys.h"
 #include "Trouble.h"
 
 #include <algorithm>
@@ -29,7 +30,7 @@ void Session::open() {
 
 void Session::setUp() const {
     OVFeedSettings settings = mClient->settings();
-    settings.setExpirationInterval(kExpirationInterval);
+    settings.setExpirationInterval(SettingKeys::kForGood);
     settings.setMaxEnclosureSize(kMaxEnclosureSize);
     mClient->setSettings(settings);
     Messages::say("New client " + mName +

@@ -15,8 +15,7 @@ class Session {
     /// Whom the command line acts for if nothing else is said: the pages of the browser show what
     /// this one has subscribed to.
     static constexpr const char* kClient = "com.tarnwick.Brisko";
-    /// What a client that is made here gets.
-    static constexpr double kExpirationInterval = -1;  ///< entries are kept for good
+    /// The largest enclosures of a client that is made here. It keeps entries for good.
     static constexpr double kMaxEnclosureSize = 500e6;
 
     /// Opens the database, and makes the client if there is none of that name. Throws `Failure`,

@@ -22,9 +22,13 @@ constexpr double kNever = -1;
     throw Failure(ExitStatus::Usage, text);
 }
 
-double interval(const std::string& text) {
+double interval(const std::string& text, double never) {
     if (text == "default") return 0;
-    return text == "never" ? kNever : DateText::parseDuration(text);
+    return text == "never" ? never : DateText::parseDuration(text);
+}
+
+std::string shownInterval(double seconds) {
+    return seconds >= SettingKeys::kForGood ? "never" : DateText::duration(seconds);
 }
 
 bool flag(const std::string& key, const std::string& text, bool byDefault) {
@@ -83,7 +87,7 @@ std::vector<Setting> all(const OVFeedSettings& own, const OVFeedSettings& client
                             OVFeedSettings::kDefaultMaxEnclosureSize);
     return {
         {"refresh", DateText::duration(refresh.value), refresh.origin},
-        {"expire", DateText::duration(expire.value), expire.origin},
+        {"expire", shownInterval(expire.value), expire.origin},
         {"background", shown(own.refreshesInBackground()), origin},
         {"enclosures", shown(own.downloadsEnclosures()), origin},
         {"max-enclosure", sizeOf(size.value), size.origin},
@@ -101,9 +105,9 @@ const std::vector<std::string>& SettingKeys::names() {
 
 void SettingKeys::set(OVFeedSettings& settings, const std::string& key, const std::string& text) {
     if (key == "refresh") {
-        settings.setRefreshInterval(interval(text));
+        settings.setRefreshInterval(interval(text, kNever));
     } else if (key == "expire") {
-        settings.setExpirationInterval(interval(text));
+        settings.setExpirationInterval(interval(text, kForGood));
     } else if (key == "background") {
         settings.setRefreshesInBackground(flag(key, text, true));
     } else if (key == "enclosures") {

@@ -9,6 +9,10 @@
 
 namespace Commands::SettingKeys {
 
+/// What "never" stands for where entries are to be kept for good: a hundred years. Of a feed whose
+/// interval is below 0, which would be good for that as well, the library tells no changes.
+inline constexpr double kForGood = 36500.0 * 24 * 3600;
+
 /// Where a value comes from.
 enum class Origin { Feed, Client, BuiltIn };
 

@@ -41,6 +41,7 @@ VerbSpec markSpec() {
     VerbSpec spec = specOf("mark", "mark entries as read or unread", "read|unread [ENTRY...]",
                            {"mark read --feed \"Planet\" --until 7d", "mark unread 3f9a21c"});
     spec.fewest = 1;
+    spec.choices = {"read", "unread"};
     return spec;
 }
 

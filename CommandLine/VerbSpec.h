@@ -31,7 +31,7 @@ struct VerbSpec {
     std::size_t fewest = 0;     ///< operands that it must be given
     std::size_t most = 0;
     WordKind kind = WordKind::Free;
-    std::vector<std::string> choices = {};  ///< of the first operand, for `WordKind::Choice`
+    std::vector<std::string> choices = {};  ///< of the first operand; empty for any
     std::vector<OptionSpec> options = {};
     const char* details = "";                ///< paragraphs, with an empty line in between
     std::vector<std::string> examples = {};  ///< what to type behind "orvane"

@@ -28,6 +28,8 @@ class OVXMLElement {
     OV_EXPORT std::optional<std::string> namespaceURI() const;
     /// The value of an attribute, by its name with its prefix; none if it is not there.
     OV_EXPORT std::optional<std::string> attribute(std::string_view name) const;
+    /// The names of all attributes with their prefixes, in their order.
+    OV_EXPORT std::vector<std::string> attributeNames() const;
     /// The text of the element and of all that is below it.
     OV_EXPORT std::string stringValue() const;
     /// The elements right below this one, in their order.

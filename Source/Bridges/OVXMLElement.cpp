@@ -83,6 +83,11 @@ std::optional<std::string> OVXMLElement::attribute(std::string_view name) const 
     });
 }
 
+std::vector<std::string> OVXMLElement::attributeNames() const {
+    return raising("-[OVXMLElement attributeNames]",
+                   [&] { return mTree->get()->getAttributeNames(); });
+}
+
 std::string OVXMLElement::stringValue() const {
     return raising("-[OVXMLElement stringValue]", [&] {
         const Ref<String> text = mTree->get()->getStringValue();

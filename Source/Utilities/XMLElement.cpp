@@ -112,6 +112,17 @@ StringReturner XMLElement::getAttribute(TextArgument name) const {
     return textOf(xmlView(value.get()));
 }
 
+std::vector<std::string> XMLElement::getAttributeNames() const {
+    std::vector<std::string> names;
+    for (const xmlAttr* each = _node()->properties; each; each = each->next) {
+        const bool hasPrefix = each->ns && each->ns->prefix;
+        std::string name = hasPrefix ? std::string(xmlView(each->ns->prefix)) + ':' : std::string();
+        name += xmlView(each->name);
+        names.push_back(std::move(name));
+    }
+    return names;
+}
+
 void XMLElement::setAttribute(TextArgument name, TextArgument value) {
     OV_ASSERT_AS(!name.isEmpty(), "name");
     const std::string text(name.view());

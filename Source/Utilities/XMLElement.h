@@ -8,6 +8,8 @@
 #include "Utilities/XMLNode.h"
 
 #include <cstdint>
+#include <string>
+#include <vector>
 
 namespace Orvane {
 
@@ -54,6 +56,8 @@ class XMLElement : public XMLNode {
 
     /// The value of an attribute, by its name with the prefix; null if there is none.
     StringReturner getAttribute(TextArgument name) const;
+    /// The names of all attributes with their prefixes, in their order.
+    std::vector<std::string> getAttributeNames() const;
     /// Null removes the attribute.
     void setAttribute(TextArgument name, TextArgument value);
 

@@ -99,6 +99,9 @@ TEST(OVXMLElement, IsLookedAt) {
     EXPECT_EQ(root->localName(), "a");
     EXPECT_EQ(root->namespaceURI(), "urn:x");
     EXPECT_EQ(root->attribute("b"), "1");
+    EXPECT_EQ(OVXMLElement::parse("<a b='1' xmlns:p='urn:p' p:c='2'/>")->attributeNames(),
+              (std::vector<std::string>{"b", "p:c"}));
+    EXPECT_TRUE(OVXMLElement::parse("<a/>")->attributeNames().empty());
     EXPECT_FALSE(root->attribute("c"));
     EXPECT_EQ(root->stringValue(), "tu");
     ASSERT_EQ(root->children().size(), 2u);

@@ -1,6 +1,7 @@
 // What shows and changes nothing.
 
 #include "CommandLine/CommandLineTest.h"
+#include "Support/PipedChild.h"
 
 namespace {
 
@@ -74,8 +75,8 @@ TEST_F(ReadingVerbs, ShowAnEntryWithNumberedLinks) {
     add("/feed");
     const std::string text = run({"show", "One"}).out;
     EXPECT_THAT(text, StartsWith("One\nFeed      The feed\n"));
-    EXPECT_THAT(text, HasSubstr("\nAbout One [1]\n\n[1] http://e.org/x\n"));
-    EXPECT_EQ(run({"show", "--links", "One"}).out, "[1] http://e.org/x\n");
+    EXPECT_THAT(text, HasSubstr("\nAbout One [1]\n\n[1] " + server.url("/x") + "\n"));
+    EXPECT_EQ(run({"show", "--links", "One"}).out, "[1] " + server.url("/x") + "\n");
     EXPECT_THAT(run({"show", "--html", "One"}).out, HasSubstr("<p>About <a "));
     EXPECT_THAT(run({"show", "--xml", "One"}).out, HasSubstr("<title"));
     // Looking at it leaves it unread.
@@ -110,6 +111,41 @@ TEST_F(ReadingVerbs, TellTheStatus) {
     EXPECT_EQ(status["unread"], 2);
     EXPECT_GT(status["databaseBytes"], 1000);
     EXPECT_THAT(run({"status"}).out, HasSubstr("Agent\trunning\n"));
+}
+
+TEST_F(ReadingVerbs, InspectWhatIsOnTheWeb) {
+    const JSON feed = JSON::parse(run({"inspect", "--json", server.url("/feed")}).out);
+    EXPECT_EQ(feed["kind"], "feed");
+    EXPECT_EQ(feed["entries"].size(), 2U);
+    server.answer("/page", Support::ServerAnswer().body(
+                               "<html><head><link rel='alternate' type='application/rss+xml' "
+                               "href='f'></head><body>x</body></html>"));
+    const JSON page = JSON::parse(run({"inspect", "--json", server.url("/page")}).out);
+    EXPECT_EQ(page["kind"], "page");
+    EXPECT_EQ(page["page"]["links"][0]["url"], server.url("/f"));
+    EXPECT_THAT(run({"inspect", server.url("/gone")}, 4).err, HasSubstr("/gone"));
+    // Nothing of it is subscribed to.
+    run({"feeds"}, 1);
+}
+
+TEST_F(ReadingVerbs, HoldNothingWhileNobodyReadsTheirPipe) {
+    std::vector<std::string> titles;
+    for (int i = 0; i < 300; ++i) {
+        titles.push_back("Entry number " + std::to_string(i));
+    }
+    server.answer("/long", Support::ServerAnswer().body(feed("Long", titles)));
+    add("/long");
+    // More than a pipe holds.
+    Support::PipedChild reader({ORVANE_PROGRAM, "entries", "--jsonl"});
+    EXPECT_THAT(reader.readLine(), HasSubstr("Entry number"));
+    EXPECT_THAT(run({"mark", "read", "--all"}).err, HasSubstr("300 entries"));
+    EXPECT_THAT(run({"rm", "Long"}).out, HasSubstr("Long"));
+    std::size_t lines = 1;
+    while (!reader.readLine().empty()) {
+        ++lines;
+    }
+    EXPECT_EQ(lines, 300U);
+    EXPECT_EQ(reader.wait(), 0);
 }
 
 TEST_F(ReadingVerbs, MakeTheClientWithSettingsOfItsOwn) {

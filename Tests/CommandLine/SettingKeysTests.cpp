@@ -23,13 +23,15 @@ std::vector<std::string> lines(const std::vector<Keys::Setting>& settings) {
 TEST(SettingKeys, SetsEachSetting) {
     OVFeedSettings settings;
     Keys::set(settings, "refresh", "2h");
+    EXPECT_EQ(settings.refreshInterval(), 7200);
     Keys::set(settings, "expire", "never");
     Keys::set(settings, "background", "no");
     Keys::set(settings, "enclosures", "yes");
     Keys::set(settings, "max-enclosure", "50MB");
     Keys::set(settings, "types", "audio/mpeg,video/mp4");
-    EXPECT_EQ(settings.refreshInterval(), 7200);
-    EXPECT_LT(settings.expirationInterval(), 0);
+    EXPECT_EQ(settings.expirationInterval(), Keys::kForGood);
+    Keys::set(settings, "refresh", "never");
+    EXPECT_LT(settings.refreshInterval(), 0);
     EXPECT_FALSE(settings.refreshesInBackground());
     EXPECT_TRUE(settings.downloadsEnclosures());
     EXPECT_EQ(settings.maxEnclosureSize(), 50e6);
@@ -62,6 +64,8 @@ TEST(SettingKeys, TellWhereValuesComeFrom) {
     OVFeedSettings client;
     client.setExpirationInterval(-1);
     client.setMaxEnclosureSize(500e6);
+    EXPECT_THAT(lines(Keys::ofFeed({}, client)).at(1), "expire=never by the client");
+    client.setExpirationInterval(Keys::kForGood);
     EXPECT_THAT(lines(Keys::ofFeed(feed, client)),
                 ElementsAre("refresh=1 hour by the feed", "expire=never by the client",
                             "background=yes by the feed", "enclosures=no by the feed",

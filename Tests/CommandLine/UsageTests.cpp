@@ -63,7 +63,7 @@ TEST(Help, TellsTheExitStatusesInTheManual) {
 TEST(Help, TellsTheOptionsOfAVerb) {
     const ChildResult result = runOrvane({"inspect", "-h"});
     EXPECT_EQ(result.status, 0);
-    for (const char* option : {"--json", "--base URL", "--tidied", "FILE..."}) {
+    for (const char* option : {"--json", "--base URL", "--tidied", "FILE|URL..."}) {
         EXPECT_THAT(result.out, HasSubstr(option));
     }
     const ChildResult manual = runOrvane({"inspect", "--help"});
