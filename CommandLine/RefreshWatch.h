@@ -20,7 +20,7 @@ class RefreshWatch : public OVClientDelegate {
 
     /// Seconds without any sign of life after which feeds that have not begun count as not
     /// refreshed now: their servers have asked to be left alone.
-    static constexpr double kQuietSeconds = 3;
+    static constexpr double kQuietSeconds = 10;
 
     /// Becomes the client's delegate, as long as this lives.
     RefreshWatch(OVClient& client, const std::vector<std::shared_ptr<OVFeed>>& feeds);
