@@ -9,7 +9,6 @@
 #include "Benchmarks/Measure.h"
 #include "Foundation/Bus.h"
 #include "Foundation/BusCenter.h"
-#include "Foundation/RunLoop.h"
 #include "Foundation/UniqueFD.h"
 #include "Support/EnvVar.h"
 #include "Support/PipedChild.h"
@@ -32,7 +31,6 @@
 #include <vector>
 
 using Benchmarks::BareEcho::Caller;
-using Foundation::RunLoop;
 
 namespace {
 
@@ -56,9 +54,8 @@ void callAll(const char* gate, const std::function<void(int)>& call) {
     }
     for (int i = 0; i < kCalls; ++i) {
         std::printf("%.9f ", Benchmarks::secondsOf([&] { call(i); }));
-        while (RunLoop::current().runInMode(RunLoop::kDefaultMode, 0, true) !=
-               RunLoop::Result::TimedOut) {
-        }
+        std::fflush(stdout);
+        CrowdMember::listen();
     }
     std::printf("\n");
 }

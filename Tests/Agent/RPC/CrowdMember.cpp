@@ -3,6 +3,7 @@
 #include "Agent/Client/IPCClient.h"
 #include "Foundation/AutoreleasePool.h"
 #include "Foundation/Data.h"
+#include "Foundation/RunLoop.h"
 #include "Foundation/URL.h"
 #include "Model/ClientCore.h"
 #include "Model/ContentCore.h"
@@ -56,6 +57,12 @@ void CrowdMember::change(int i) const {
             content->mData.setValue(Data::adopt(std::to_string(i)));
             own->setContent(content);
         }
+    }
+}
+
+void CrowdMember::listen() {
+    const auto turn = [] { return RunLoop::current().runInMode(RunLoop::kDefaultMode, 0, true); };
+    while (turn() != RunLoop::Result::TimedOut) {
     }
 }
 

@@ -19,6 +19,8 @@ class CrowdMember {
 
     /// Makes the `i`-th of its calls, which are of several kinds. Throws if it fails.
     void change(int i) const;
+    /// Serves what has come for the process by now, such as the news of what others have changed.
+    static void listen();
     /// Whether all that is in memory is as in the file.
     bool isEqual() const;
 
