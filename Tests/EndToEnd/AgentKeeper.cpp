@@ -79,6 +79,7 @@ void AgentKeeper::advanceTo(double date, std::vector<AgentEvent>& events) {
 void AgentKeeper::sleepTo(double date, std::vector<AgentEvent>& events) {
     meet();
     mWorld.moveTo(date);
+    if (mAgent) World::send(mAgent.get(), "wake");
     advanceTo(date, events);
 }
 
@@ -144,7 +145,11 @@ void AgentKeeper::killAgent(std::vector<AgentEvent>& events) {
     while (true) {
         await();
         const std::string message = World::receive(mAgent.get());
-        if (message.empty()) return buryAgent(events);
+        if (message.empty()) break;
         take(message, events);
     }
+    buryAgent(events);
+    // Who calls before the bus has noticed calls the one that is dead.
+    const auto isForgotten = [] { return Bus::user().getNameOwner(BusCenter::kAgentName).empty(); };
+    if (!turnUntil(isForgotten, kPatience)) throw std::runtime_error("the bus notices no death");
 }

@@ -34,6 +34,8 @@ class AgentKeeper {
     void advanceTo(double date, std::vector<AgentEvent>& events);
     /// The machine sleeps up to a date, and wakes: no time passes for anybody in between.
     void sleepTo(double date, std::vector<AgentEvent>& events);
+    /// Tells the agent that there is a network again. REQUIRES: there is an agent.
+    void announceNetwork() { World::send(mAgent.get(), "network"); }
     /// Kills the agent, if there is one.
     void killAgent(std::vector<AgentEvent>& events);
     /// Whether there is one now.

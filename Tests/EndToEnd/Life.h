@@ -49,11 +49,16 @@ class LifeTest : public testing::Test {
 
     /// Makes so many feeds, and has the clients subscribe to them.
     void begin(int feeds);
-    /// A day in steps of some hours, with an evening on which the clients look at what there is.
+    /// A day in steps of some hours, in which much happens, and an evening on which the clients
+    /// look at what there is. Then all is compared with the model.
     void liveADay();
-    void compare() const;
 
+    void live(int days);
+    void compare();
     void advanceBy(double seconds);
+    void sleepFor(double seconds);
+    void loseNetworkFor(double seconds);
+    void killAgent();
     void take();
     bool happens(int percent) { return between(0, 99) < percent; }
     int between(int least, int most) {
@@ -63,8 +68,15 @@ class LifeTest : public testing::Test {
     // What clients do.
 
     void subscribe(const std::string& client, ScriptedFeed& feed);
+    using FeedPtr = std::shared_ptr<OVFeed>;
+    FeedPtr anyFeed(const std::string& client);
+    void wakeAgent();
+    void changeIntervals();
+    void unsubscribe();
+    void refreshSome();
     void readSome(const std::string& client);
-    void spendTheEvening();
+    void spendTheEvening(bool withKill);
+    void compareClient(const std::string& client);
 
     const unsigned seed;
     std::mt19937 random;
@@ -79,4 +91,6 @@ class LifeTest : public testing::Test {
     AgentKeeper keeper;
     std::vector<AgentEvent> events;
     std::map<std::string, ClientPtr> clients;
+    ScriptedFeed* left = nullptr;  ///< a feed that was unsubscribed from
+    int day = 0;
 };

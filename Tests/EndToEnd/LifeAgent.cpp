@@ -6,7 +6,8 @@
 //   reached TIME          it has nothing to do before the time that the test has named last
 //   rest TIME SECONDS     it is about to end, and wants to be started again after so long
 //
-// The test names times, as numbers. By itself no time passes.
+// The test names times, as numbers, or says "wake" after a sleep of the machine, and "network" when
+// there is one again. By itself no time passes.
 
 #include "Agent/OVAgentFrameworkMain.h"
 #include "Agent/ServiceManager.h"
@@ -14,6 +15,7 @@
 #include "Foundation/ApplicationIdentity.h"
 #include "Foundation/Notification.h"
 #include "Foundation/NotificationCenter.h"
+#include "Foundation/NotificationNames.h"
 #include "Foundation/RunLoop.h"
 #include "Foundation/URL.h"
 #include "Model/FeedCore.h"
@@ -90,8 +92,13 @@ class AgentClock : public WorldClock {
     void takeTarget() {
         const std::string message = World::receive(mLine.getFD());
         if (message.empty()) _exit(3);
+        if (message == "wake") return post(NotificationNames::kDidWake);
+        if (message == "network") return post(NotificationNames::kNetworkChanged);
         mTarget = std::strtod(message.c_str(), nullptr);
         mHasReached = false;
+    }
+    static void post(const NotificationName& name) {
+        NotificationCenter::getLocal()->post(name.string(), nullptr, nullptr);
     }
     void refreshBegan(Notification*) { ++mRefreshing; }
     void refreshEnded(Notification* notification) {

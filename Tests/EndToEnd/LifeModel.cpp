@@ -40,6 +40,7 @@ void LifeModel::subscribe(const std::string& client, const std::string& url, dou
     if (!feed) feed = std::make_unique<ModelFeed>(url, now);
     ModelSubscription& subscription = feed->subscriptions[client];
     subscription.client = client;
+    feed->since = now;
     if (bump(subscription, now)) subscription.unread = feed->countUnread(subscription);
 }
 
@@ -53,6 +54,7 @@ void LifeModel::setIntervals(const std::string& client, const std::string& url, 
     ModelFeed& changed = feed(url);
     ModelSubscription& subscription = changed.subscriptions.at(client);
     subscription.refresh = refresh;
+    changed.since = now;
     if (subscription.expiration == expiration) return;
     subscription.expiration = expiration;
     if (bump(subscription, now)) subscription.unread = changed.countUnread(subscription);
@@ -80,7 +82,8 @@ void LifeModel::take(const AgentEvent& event) {
             const auto found = mFeeds.find(event.url);
             if (found == mFeeds.end()) break;
             const bool isForced = mForced.erase(event.url) > 0;
-            checkTime(*found->second, event.time, isForced);
+            const bool isAgain = mTriedAgain.erase(event.url) > 0;
+            if (!isForced && !isAgain) checkTime(*found->second, event.time);
             found->second->refresh(event.time, mServed(event.url, event.time), isForced, mRefused);
             break;
         }
@@ -89,9 +92,6 @@ void LifeModel::take(const AgentEvent& event) {
         case AgentEvent::Kind::Gone:
             mHasAgent = false;
             mNextDailyRun = kNever;
-            // What it had begun nobody will end.
-            for (const auto& [url, feed] : mFeeds)
-                mServed(url, event.time);
             break;
     }
 }
@@ -106,21 +106,39 @@ double LifeModel::intervalOf(const ModelFeed& feed) const {
     return std::max(interval, kShortestInterval);
 }
 
-void LifeModel::checkTime(const ModelFeed& feed, double now, bool isForced) const {
-    if (isForced || feed.refreshed == 0) return;
-    const double due = feed.refreshed + intervalOf(feed);
-    EXPECT_GE(now, due - kRefreshNow - kTolerance) << "too early: " << feed.url;
-    EXPECT_LE(now, std::max(due, mExcusedUntil) + kLatest) << "too late: " << feed.url;
+bool LifeModel::isScheduled(const ModelFeed& feed) {
+    return std::any_of(feed.subscriptions.begin(), feed.subscriptions.end(),
+                       [](const auto& each) { return each.second.refresh >= 0; });
+}
+
+/// When the feed is to be refreshed next, or could be at the earliest.
+double LifeModel::dueDate(const ModelFeed& feed) const {
+    return feed.refreshed == 0 ? feed.since : feed.refreshed + intervalOf(feed);
+}
+
+void LifeModel::checkTime(const ModelFeed& feed, double now) const {
+    EXPECT_GE(now, dueDate(feed) - kRefreshNow - kTolerance) << "too early: " << feed.url;
 }
 
 void LifeModel::passTo(double now) {
     while (mHasAgent && mNextDailyRun <= now)
         runDaily(mNextDailyRun);
     for (const auto& [url, feed] : mFeeds) {
-        const double interval = intervalOf(*feed);
-        if (interval == kNever) continue;
-        const double due = feed->refreshed == 0 ? feed->since : feed->refreshed + interval;
-        EXPECT_LE(now, std::max(due, mExcusedUntil) + kLatest) << "not refreshed: " << url;
+        if (intervalOf(*feed) == kNever) continue;
+        // Whoever changes the schedule, or lets the machine sleep, is to blame.
+        const double due = std::max({dueDate(*feed), feed->since, mExcusedUntil});
+        EXPECT_LE(now, due + kLatest) << "not refreshed: " << url;
+    }
+}
+
+void LifeModel::wake(double now) {
+    mExcusedUntil = now;
+    mNextDailyRun = std::max(mNextDailyRun, now);
+}
+
+void LifeModel::findNetwork() {
+    for (const auto& [url, feed] : mFeeds) {
+        if (feed->missesNetwork() && isScheduled(*feed)) mTriedAgain.insert(url);
     }
 }
 

@@ -21,9 +21,9 @@ struct ModelClient {
 /// agent lived.
 class LifeModel {
  public:
-    using Source = std::function<std::deque<Served>(const std::string& url, double until)>;
+    using Source = std::function<std::deque<Served>(const std::string& url, double time)>;
 
-    /// `served` gives what a feed has served up to a time, and was not asked for before.
+    /// `served` gives what a feed has served at a time.
     explicit LifeModel(Source served) : mServed(std::move(served)) {}
 
     // What clients do.
@@ -34,16 +34,20 @@ class LifeModel {
     void setIntervals(const std::string& client, const std::string& url, double refresh,
                       double expiration, double now);
     void setFlags(const std::string& url, const std::string& entry, bool read, bool flagged);
-    /// A client has asked for a refresh.
-    void force(const std::string& url) { mForced.insert(url); }
+    /// A client asks for a refresh. False if one has been asked for already.
+    bool force(const std::string& url) { return mForced.insert(url).second; }
 
     // What the agent does.
 
     void take(const AgentEvent& event);
     /// All has happened up to here. Whoever did not refresh what is due fails the test.
     void passTo(double now);
-    /// Something has kept the agent from its work up to here.
-    void excuse(double now) { mExcusedUntil = now; }
+    /// The machine has slept up to here.
+    void wake(double now);
+    /// There is a network again.
+    void findNetwork();
+    /// Whether all has been tried again that failed for want of one.
+    bool hasTriedAgain() const { return mTriedAgain.empty(); }
 
     const std::map<std::string, std::unique_ptr<ModelFeed>>& feeds() const { return mFeeds; }
     const std::map<std::string, ModelClient>& clients() const { return mClients; }
@@ -55,7 +59,9 @@ class LifeModel {
     double intervalOf(const ModelFeed& feed) const;
     double expirationOf(const ModelSubscription& subscription) const;
     bool bump(ModelSubscription& subscription, double now) const;
-    void checkTime(const ModelFeed& feed, double now, bool isForced) const;
+    static bool isScheduled(const ModelFeed& feed);
+    double dueDate(const ModelFeed& feed) const;
+    void checkTime(const ModelFeed& feed, double now) const;
     void scheduleDailyRun(double now);
     void runDaily(double now);
 
@@ -63,6 +69,7 @@ class LifeModel {
     std::map<std::string, ModelClient> mClients;
     std::map<std::string, std::unique_ptr<ModelFeed>> mFeeds;
     std::set<std::string> mForced;
+    std::set<std::string> mTriedAgain;  ///< or to be
     RefusedHosts mRefused;
     bool mHasAgent = false;
     double mLastDailyRun = 0;

@@ -188,11 +188,13 @@ bool ModelFeed::mergeEntries(double now, const FeedContent& feed) {
 }
 
 int ModelFeed::countUnread(const ModelSubscription& subscription) const {
-    // What never had a date lets nothing be counted.
-    if (!subscription.expirationDate) return 0;
     return static_cast<int>(std::count_if(entries.begin(), entries.end(), [&](const auto& each) {
-        return !each.second.read && each.second.created > *subscription.expirationDate;
+        return !each.second.read && each.second.created > subscription.expirationDate.value_or(0);
     }));
+}
+
+bool ModelFeed::missesNetwork() const {
+    return isOfNetwork(error);
 }
 
 void ModelFeed::recount() {

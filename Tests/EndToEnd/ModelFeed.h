@@ -48,6 +48,8 @@ class ModelFeed {
 
     /// A refresh has ended, in which this was served. `force`: somebody has asked for it.
     void refresh(double now, std::deque<Served> served, bool force, RefusedHosts& refused);
+    /// Whether the last refresh failed for want of a network.
+    bool missesNetwork() const;
     /// The unread count of every subscription is computed anew.
     void recount();
     /// How many are unread for a subscription.
@@ -60,7 +62,7 @@ class ModelFeed {
 
     const std::string url;
     const std::string identifier;
-    const double since;  ///< when it was first subscribed to
+    double since;  ///< when its schedule was last changed
     std::optional<std::string> redirected;
     std::string eTag;
     std::string lastModified;

@@ -44,12 +44,18 @@ std::string ScriptedFeed::pathOf(int place) const {
     return path + (place == kAway ? "/away" : "/place" + std::to_string(place));
 }
 
-std::deque<Served> ScriptedFeed::takeServed(double until) {
+std::deque<Served> ScriptedFeed::takeServed(double time) {
     const std::scoped_lock lock(mMutex);
     std::deque<Served> taken;
-    for (; !mServed.empty() && mServed.front().time <= until; mServed.pop_front())
-        taken.push_back(std::move(mServed.front()));
+    for (; !mServed.empty() && mServed.front().time <= time; mServed.pop_front()) {
+        if (mServed.front().time == time) taken.push_back(std::move(mServed.front()));
+    }
     return taken;
+}
+
+void ScriptedFeed::setReachable(bool reachable) {
+    const std::scoped_lock lock(mMutex);
+    mIsReachable = reachable;
 }
 
 // What happens.
@@ -61,10 +67,8 @@ void ScriptedFeed::live() {
     if (happens(20)) change();
     if (happens(8)) lose();
     if (happens(8)) bringBack();
-    if (!mIsCalm) {
-        if (happens(4)) move();
-        if (happens(mTrouble == Trouble::None ? 4 : 50)) changeTrouble();
-    }
+    if (happens(4)) move();
+    if (happens(mTrouble == Trouble::None ? 4 : 50)) changeTrouble();
     // Some say nothing of the change: it counts for nothing.
     const bool says = mContent.date && !happens(15);
     if (before.posts != mContent.posts) publish(says ? now : mContent.date.value_or(now));
@@ -143,6 +147,7 @@ void ScriptedFeed::move() {
 
 void ScriptedFeed::changeTrouble() {
     const std::scoped_lock lock(mMutex);
+    if (mTrouble == Trouble::Gone) return;
     const bool hadTrouble = mTrouble != Trouble::None;
     mTrouble = hadTrouble ? Trouble::None
                           : static_cast<Trouble>(between(1, static_cast<int>(Trouble::Truncated)));
@@ -178,7 +183,9 @@ ServerAnswer ScriptedFeed::answer(const ServerRequest& request) {
     served.ifModifiedSince = request.header("if-modified-since");
     ServerAnswer answer;
     const std::string path = request.path();
-    if (path == pathOf(mPlace)) {
+    if (!mIsReachable) {
+        answer = breakOff(served);
+    } else if (path == pathOf(mPlace)) {
         answer = mIsAway ? redirect(served, 302, pathOf(kAway)) : answerAtHome(request, served);
     } else if (path == pathOf(kAway) && mIsAway) {
         answer = answerAtHome(request, served);
@@ -216,8 +223,7 @@ ServerAnswer ScriptedFeed::answerInTrouble(Served& served) const {
             return fail(served, 429)
                 .header("Retry-After", std::to_string(static_cast<int>(mRetryAfter)));
         case Trouble::Reset:
-            served.kind = Served::Kind::Break;
-            return ServerAnswer::raw("").reset();
+            return breakOff(served);
         case Trouble::Truncated: {
             served.kind = Served::Kind::BadBody;
             const std::string whole = Support::gzipped(mVersion->bytes);
@@ -231,6 +237,11 @@ ServerAnswer ScriptedFeed::answerInTrouble(Served& served) const {
             break;
     }
     return document(rubbish(), served);
+}
+
+ServerAnswer ScriptedFeed::breakOff(Served& served) {
+    served.kind = Served::Kind::Break;
+    return ServerAnswer::raw("").reset();
 }
 
 ServerAnswer ScriptedFeed::fail(Served& served, int status) {

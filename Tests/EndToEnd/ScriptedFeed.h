@@ -50,7 +50,7 @@ class ScriptedFeed {
     enum class Trouble {
         None,
         NotFound,
-        Gone,
+        Gone,  ///< for good
         Internal,
         TooMany,    ///< wants to be left alone
         Reset,      ///< breaks connections
@@ -65,11 +65,11 @@ class ScriptedFeed {
     std::string getURL() const { return mAddress + pathOf(0); }
     /// Something may happen to it.
     void live();
-    /// From now on nothing but posts come.
-    void calmDown() { mIsCalm = true; }
+    /// Whether anybody can reach it.
+    void setReachable(bool reachable);
     Support::ServerAnswer answer(const Support::ServerRequest& request);
-    /// The answers up to a time, less those that were taken before.
-    std::deque<Served> takeServed(double until);
+    /// The answers at this time. Those before it, which nobody has taken, are dropped.
+    std::deque<Served> takeServed(double time);
 
  private:
     static constexpr std::size_t kPosts = 8;  ///< in a document
@@ -92,6 +92,7 @@ class ScriptedFeed {
 
     Support::ServerAnswer answerAtHome(const Support::ServerRequest& request, Served& served);
     Support::ServerAnswer answerInTrouble(Served& served) const;
+    static Support::ServerAnswer breakOff(Served& served);
     static Support::ServerAnswer fail(Served& served, int status);
     static Support::ServerAnswer redirect(Served& served, int status, const std::string& location);
     Support::ServerAnswer document(const std::shared_ptr<const Version>& version,
@@ -101,7 +102,6 @@ class ScriptedFeed {
     const std::string mAddress;
     const World& mWorld;
     std::mt19937 mRandom;
-    bool mIsCalm = false;
     bool mUsesETags = false;
     bool mUsesDates = false;
     bool mUsesGzip = false;
@@ -114,6 +114,7 @@ class ScriptedFeed {
     int mPlace = 0;        ///< where it is; it leads there from where it was
     bool mIsAway = false;  ///< for a while, somewhere else
     int mMoveStatus = 301;
+    bool mIsReachable = true;
     Trouble mTrouble = Trouble::None;
     double mRetryAfter = 0;
     std::shared_ptr<const Version> mVersion;
