@@ -84,8 +84,8 @@ class LifeTest : public testing::Test {
     World world{home.home / "life", kStart};
     WorldClock clock{world};
     Support::PrivateBus bus;
-    Support::ScriptedServer server;
     std::vector<std::unique_ptr<ScriptedFeed>> web;
+    Support::ScriptedServer server;  ///< ends before the web that it asks
     std::map<std::string, ScriptedFeed*> byURL;
     LifeModel model;
     AgentKeeper keeper;
