@@ -20,7 +20,6 @@
 #include <filesystem>
 #include <optional>
 #include <set>
-#include <stdexcept>
 #include <utility>
 
 using namespace Orvane;
@@ -158,59 +157,6 @@ TEST_F(CurlTransportTest, HandsNothingOfItsOwnOnToProcessesItStarts) {
     const CurlTransport another;
     EXPECT_EQ(inheritedDescriptors(), before);
 }
-
-/// Fails at one of its calls.
-class BrokenClient : public ExchangeClient {
- public:
-    explicit BrokenClient(std::string breaksAt) : mBreaksAt(std::move(breaksAt)) {}
-
-    void moved() override { note("moved"); }
-    void gotHead(ExchangeHead) override { note("head"); }
-    void gotBody(std::string_view) override { note("body"); }
-    void ended(const ExchangeEnd& end) override {
-        ++ends;
-        error = end.error;
-        note("end");
-    }
-
-    Notes notes;  ///< but for movements
-    int ends = 0;
-    Foundation::NetError error;
-
- private:
-    void note(const std::string& what) {
-        if (what != "moved") notes.push_back(what);
-        if (what == mBreaksAt) throw std::runtime_error("no");
-    }
-
-    const std::string mBreaksAt;
-};
-
-class CurlTransportFailure : public CurlTransportTest,
-                             public testing::WithParamInterface<std::pair<const char*, Notes>> {};
-
-TEST_P(CurlTransportFailure, EndsWithAClientThatFails) {
-    mServer.answer("/a", ServerAnswer().body("one").wait("gate").body("two"));
-    const Support::LogCapture log;
-    BrokenClient client(GetParam().first);
-    ExchangeRequest request;
-    const Ref<Foundation::URL> url = Foundation::URL::url(text(mServer.url("/a")).get());
-    request.message = HTTPMessage::request(text("GET").get(), url);
-    CurlTransport transport;
-    const std::unique_ptr<Exchange> exchange = transport.start(request, client, nullptr);
-    mServer.letThrough("gate");
-    // What is left is not kept for an event that never comes.
-    EXPECT_TRUE(Support::turnUntil([&] { return client.ends > 0; }));
-    EXPECT_EQ(client.ends, 1);
-    EXPECT_EQ(client.notes, GetParam().second);
-    EXPECT_EQ(client.error, Foundation::NetError(Foundation::NetError::kOrvane, OVInternalError));
-    EXPECT_TRUE(log.contains("std::runtime_error \"no\" caught in"));
-}
-
-INSTANTIATE_TEST_SUITE_P(At, CurlTransportFailure,
-                         testing::Values(std::pair("moved", Notes{"end"}),
-                                         std::pair("head", Notes{"head", "end"}),
-                                         std::pair("body", Notes{"head", "body", "end"})));
 
 TEST_F(CurlTransportTest, MakesNoMoreThanSixConnectionsToAHost) {
     mServer.answer("/a", ServerAnswer().holdHead("gate").body("x"));
