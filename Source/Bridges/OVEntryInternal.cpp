@@ -12,6 +12,11 @@
 using namespace Foundation;
 using namespace Orvane;
 
+void OVEntryInternal::_initWithCore(EntryCore* core, OVObject* object) {
+    setCore(core, object);
+    noteIdentifier();
+}
+
 /// Whether a feed is not the one any more that the entry was found by, because its subscription has
 /// ended.
 bool OVEntryInternal::hasMoved(const OVFeed& from) const {
@@ -48,10 +53,15 @@ std::shared_ptr<OVClient> OVEntryInternal::findClient() const {
     return feed ? feed->client() : nullptr;
 }
 
+void OVEntryInternal::noteIdentifier() {
+    const EntryCore* row = peek();
+    if (row->mIdentifier.isLoaded()) mIdentifier = row->mIdentifier.getValue();
+}
+
 Ref<Core> OVEntryInternal::findAgain() {
-    const EntryCore* old = peek();
-    if (!old->mIdentifier.isLoaded() || !old->mIdentifier.getValue()) return nullptr;
-    const Ref<EntryCore> again = EntryCore::getEntryWithIdentifier(old->mIdentifier.getValue());
+    noteIdentifier();
+    if (!mIdentifier.get()) return nullptr;
+    const Ref<EntryCore> again = EntryCore::getEntryWithIdentifier(mIdentifier.get());
     return Ref<Core>(again);
 }
 

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "Bridges/OVInternal.h"
+#include "Foundation/String.h"
 #include "Model/EntryCore.h"
 
 #include <Orvane/OVEntry.h>
@@ -14,6 +15,9 @@ class OVFeed;
 /// The state of an `OVEntry`.
 class OVEntryInternal : public OVInternal {
  public:
+    /// Stands for a row from now on.
+    void _initWithCore(Orvane::EntryCore* core, OVObject* object);
+
     /// The row, for use: see `OVInternal::useCore`.
     Orvane::EntryCore& core() const { return static_cast<Orvane::EntryCore&>(useCore()); }
     /// The same to look at; null only while the object is made.
@@ -41,4 +45,8 @@ class OVEntryInternal : public OVInternal {
 
  private:
     bool hasMoved(const OVFeed& from) const;
+    void noteIdentifier();
+
+    /// By which the entry is found again, when what was read of the row has been let go of.
+    Foundation::Ref<Foundation::String> mIdentifier;
 };

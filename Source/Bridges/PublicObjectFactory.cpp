@@ -63,7 +63,10 @@ OVObject* PublicObjectFactory::make(SubscriptionCore* row) {
 }
 
 OVObject* PublicObjectFactory::make(EntryCore* row) {
-    return madeFor(row, [row] { return OVObjectMaker::makeFor<OVEntry, OVEntryInternal>(row); });
+    return madeFor(row, [row] {
+        return OVObjectMaker::make<OVEntry, OVEntryInternal>(
+            [row](OVEntryInternal& state, OVObject* object) { state._initWithCore(row, object); });
+    });
 }
 
 OVObject* PublicObjectFactory::make(ContentCore* row) {

@@ -60,6 +60,13 @@ TEST_F(ReplacedDatabaseTest, NoSecondObjectIsMade) {
     EXPECT_EQ(client->entryWithIdentifier("e1"), entry);
 }
 
+TEST_F(ReplacedDatabaseTest, EntriesThatWereLetGoOfAreFoundAsWell) {
+    entry->_internal().peek()->unload();
+    replace();
+    EXPECT_EQ(entry->title(), "Title");
+    EXPECT_EQ(entry->_internal().peek()->getRowID(), 11);
+}
+
 TEST_F(ReplacedDatabaseTest, NewRowsAreHeardOf) {
     replace();
     RecordingDelegate delegate;

@@ -8,6 +8,7 @@
 #include "Model/UnreachableAgent.h"
 #include "SQLite/Exception.h"
 
+#include <fstream>
 #include <functional>
 
 using namespace Foundation;
@@ -216,4 +217,57 @@ TEST_F(ClientSessionTest, OpensTheFileThatReplacesItsOwn) {
     EXPECT_EQ(log.count("***** Database was replaced by agent ..."), 1);
     EXPECT_TRUE(isOpenForReading());
     EXPECT_EQ(ClientCore::getRow(1)->mSignature.getValue()->utf8(), "b");
+}
+
+// Where nobody turns the run loop, nothing is told.
+
+TEST_F(ClientSessionTest, FollowsTheFileWhereNobodyTurnsTheLoop) {
+    makeCurrent();
+    ASSERT_TRUE(open());
+    const std::uint32_t generation = db().getGeneration();
+    fs::rename(file(), storage() / "old");
+    ClientSession::catchUpIfUnturned();
+    // There is nothing else to read yet.
+    EXPECT_EQ(db().getGeneration(), generation);
+    EXPECT_TRUE(isOpenForReading());
+    fs::copy(storage() / "old", file());
+    ClientSession::catchUpIfUnturned();
+    EXPECT_NE(db().getGeneration(), generation);
+    EXPECT_TRUE(isOpenForReading());
+    EXPECT_EQ(log.count("***** Database was replaced, and nobody turns the run loop ..."), 1);
+    ClientSession::catchUpIfUnturned();
+    EXPECT_EQ(log.count("***** Database was replaced, and nobody turns the run loop ..."), 1);
+    EXPECT_EQ(agent.codes, Codes{});
+}
+
+TEST_F(ClientSessionTest, WaitsForTheAgentThatStillMakesTheNewFile) {
+    makeCurrent();
+    ASSERT_TRUE(open());
+    fs::rename(file(), storage() / "old");
+    std::ofstream(file()).close();
+    ClientSession::catchUpIfUnturned();
+    EXPECT_EQ(agent.codes, Codes{17});
+    EXPECT_TRUE(isOpenForReading());
+}
+
+TEST_F(ClientSessionTest, HasTheAgentMendAtTheNextUseWhatNobodyWasTold) {
+    makeCurrent();
+    ASSERT_TRUE(open());
+    EXPECT_THROW(db()._throwQueryException(SQLite::Exception(11, "torn")), SQLite::Exception);
+    ClientSession::catchUpIfUnturned();
+    EXPECT_EQ(agent.codes, Codes{11});
+    EXPECT_TRUE(isOpenForReading());
+    // Who turns the loop later is not told once more.
+    clock.advanceBy(0);
+    EXPECT_EQ(agent.codes, Codes{11});
+}
+
+TEST_F(ClientSessionTest, TriesAgainAtTheNextUseWhatCouldNotBeMended) {
+    makeCurrent();
+    ASSERT_TRUE(open());
+    agent.repair = nullptr;
+    fail();
+    EXPECT_FALSE(db().isOpen());
+    ClientSession::catchUpIfUnturned();
+    EXPECT_TRUE(isOpenForReading());
 }
