@@ -231,6 +231,10 @@ void LifeTest::refreshSome() {
 
 /// The reader looks at a feed, and has read some of it when he leaves.
 void LifeTest::readSome(const std::string& client) {
+    // An agent that a call starts may have to do at once what is to be done once a day, and delete
+    // what has just been listed.
+    wakeAgent();
+    advanceBy(0);
     const FeedPtr feed = anyFeed(client);
     const std::string url = feed->URL().value_or("");
     OVEntry::List entries = feed->entries();
